@@ -1,0 +1,17 @@
+/// \file
+/// PointT.h: the host's own point type.
+#ifndef QELCORE_GEOM_POINTT_H
+#define QELCORE_GEOM_POINTT_H
+
+namespace qelcore::geom {
+
+/// A pair of coordinates.
+template <class T>
+struct PointT {
+  T x;
+  T y;
+};
+
+}  // namespace qelcore::geom
+
+#endif  // QELCORE_GEOM_POINTT_H

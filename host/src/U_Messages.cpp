@@ -1,0 +1,98 @@
+// Messages in the user's language, from gettext's catalogues.
+
+#include <dlfcn.h>
+#include <libintl.h>
+
+#include <cstdint>
+#include <cstring>
+#include <filesystem>
+#include <mutex>
+#include <string>
+#include <string_view>
+
+#include "U.h"
+#include "U_Limits.h"
+
+namespace {
+
+// The layout in which a component hands over its messages.
+struct Entry {
+  const char* key;
+  uint64_t cache[3];
+};
+struct Header {
+  const char* component;
+  uint64_t count;  // with the terminator
+  const Entry* table;
+  uint64_t reserved;
+};
+
+std::mutex folderMutex;
+std::string chosenFolder;  // empty: the folder beside the library
+
+// The folder of the translations, relative to the file that holds this code, so that an installed
+// tree can be moved.
+std::string OwnFolder() {
+  Dl_info info;
+  if (dladdr(reinterpret_cast<const void*>(&OwnFolder), &info) == 0) return {};
+  std::error_code error;
+  const auto file = std::filesystem::canonical(info.dli_fname, error);
+  return error ? std::string() : (file.parent_path() / U_RELATIVE_LOCALE_FOLDER).string();
+}
+
+void BindCatalogue(const char* component) {
+  static const std::string ownFolder = OwnFolder();
+  const std::lock_guard lock(folderMutex);
+  const std::string& folder = chosenFolder.empty() ? ownFolder : chosenFolder;
+  if (folder.empty()) return;
+  const char* const bound = bindtextdomain(component, nullptr);
+  if (!bound || folder != bound) bindtextdomain(component, folder.c_str());
+}
+
+// The next placeholder of a format: from a '%' up to its conversion letter. Moves
+// `text` behind it; empty at the end.
+std::string_view NextPlaceholder(const char** text) {
+  const char* const start = std::strchr(*text, '%');
+  if (!start) return {};
+  const char* end = start + 1 + std::strcspn(start + 1, "%diouxXeEfFgGaAcCsSpnm");
+  if (*end) ++end;
+  *text = end;
+  return {start, end};
+}
+
+bool HaveSamePlaceholders(const char* a, const char* b) {
+  std::string_view found;
+  do {
+    found = NextPlaceholder(&a);
+    if (found != NextPlaceholder(&b)) return false;
+  } while (!found.empty());
+  return true;
+}
+
+}  // namespace
+
+extern "C" {
+
+const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t, int32_t) {
+  const auto* const strings = static_cast<const Header*>(header);
+  if (index < 0 || static_cast<uint64_t>(index) >= strings->count) return "";
+  const char* const key = strings->table[index].key;
+  const char* const separator = key ? std::strchr(key, '=') : nullptr;
+  if (!separator) return "";
+  const char* const english = separator + 1;
+  if (std::strlen(english) >= U_TEXT_BYTES || *english == '\0') return "";
+  BindCatalogue(strings->component);
+  const char* const translation = dgettext(strings->component, english);
+  // A catalogue comes from outside: a text that could make a report read arguments it was not
+  // given, or run over the buffer, is left alone.
+  const bool isUsable =
+      std::strlen(translation) < U_TEXT_BYTES && HaveSamePlaceholders(translation, english);
+  return isUsable ? translation : english;
+}
+
+void U_SetMessageFolder(const char* folder) {
+  const std::lock_guard lock(folderMutex);
+  chosenFolder = folder ? folder : "";
+}
+
+}  // extern "C"

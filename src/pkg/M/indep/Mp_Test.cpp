@@ -1,0 +1,3 @@
+#include "Mp_Life.h"
+
+extern "C" void Mp_TestAreEqual() {}
