@@ -1,0 +1,122 @@
+#include "TestHost.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <new>
+
+#include "U.h"
+#include "XLOG.h"
+
+TestHost host;
+
+namespace {
+
+char buffer[4096];
+
+struct Entry {
+  const char* key;
+  uint64_t cache[3];
+};
+struct Header {
+  const char* component;
+  uint64_t count;
+  const Entry* table;
+};
+
+template <class... Args>
+void Note(const char* format, Args... args) {
+  char text[sizeof buffer + 100];
+  std::snprintf(text, sizeof text, format, args...);
+  host.calls.emplace_back(text);
+  ++host.touches;
+}
+
+U_Handle Allocate(size_t bytes) {
+  ++host.allocations;
+  if (std::count(host.failing.begin(), host.failing.end(), host.allocations)) return nullptr;
+  ++host.handles;
+  return new void*(std::malloc(bytes));
+}
+
+}  // namespace
+
+extern "C" {
+
+U_Handle U_AllocateHandle(uint32_t id, const char* name, size_t bytes) {
+  Note("allocate %x %s %zu", id, name, bytes);
+  return Allocate(bytes);
+}
+
+U_Handle U_AllocateHandleQuiet(size_t bytes) {
+  Note("allocate %zu", bytes);
+  return Allocate(bytes);
+}
+
+void U_FreeHandle(U_Handle handle) {
+  Note("free");
+  std::free(*handle);
+  delete handle;
+  --host.handles;
+}
+
+const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t, int32_t) {
+  ++host.touches;
+  const auto* const strings = static_cast<const Header*>(header);
+  EXPECT_STREQ(strings->component, "M");
+  if (index < 0 || static_cast<uint64_t>(index) + 1 >= strings->count) return "(no such text)";
+  return std::strchr(strings->table[index].key, '=') + 1;
+}
+
+char* Up_GetThreadLoggingBuffer(void) {
+  ++host.touches;
+  return buffer;
+}
+
+void Up_SetThreadLastError(int32_t error) {
+  ++host.touches;
+  EXPECT_EQ(error, 0);
+  std::strcpy(buffer, "(not written)");
+}
+
+int32_t Up_ReportError(uint32_t id, int32_t severity) {
+  Note("%x %d %s", id, severity, buffer);
+  return 77;
+}
+
+int32_t Up_ReportErrString(uint32_t id, int32_t severity, const char* text) {
+  Note("%x %d %s", id, severity, text);
+  return 78;
+}
+
+int32_t Up_ReportVarkErrString(uint32_t id, int32_t severity, int32_t hostError, const char* text) {
+  Note("%x %d host %d %s", id, severity, hostError, text ? text : "-");
+  return host.reportResult != 0 ? host.reportResult : hostError;
+}
+
+int32_t U_TranslateAndReportException(const std::exception& thrown) {
+  Note("exception %s", thrown.what());
+  return 79;
+}
+
+int64_t WideMultiply(int32_t a, int32_t b) {
+  ++host.touches;
+  return int64_t{a} * b;
+}
+
+void XLOG_Log(int32_t level, const char* component, const char* event, const char* text) {
+  Note("log %d %s %s %s", level, component, event, text);
+}
+
+}  // extern "C"
+
+void* U_MemTrackedObject::TrackedNew(size_t bytes, bool) {
+  Note("new %zu", bytes);
+  return ::operator new(bytes);
+}
+
+void U_MemTrackedObject::TrackedDelete(void* block) {
+  Note("delete");
+  ::operator delete(block);
+}
