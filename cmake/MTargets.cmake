@@ -50,6 +50,12 @@ function(m_install_package)
   set(pc_folder ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
   # Relative, so that an installed tree can be moved.
   file(RELATIVE_PATH pc_prefix /prefix/${pc_folder} /prefix)
+  if(APPLE)
+    # -lM would find the system's libm.
+    set(pc_libs "\${libdir}/M${CMAKE_SHARED_LIBRARY_SUFFIX} \${libdir}/MHost${CMAKE_SHARED_LIBRARY_SUFFIX}")
+  else()
+    set(pc_libs "-L\${libdir} -lM -lMHost")
+  endif()
   configure_file(cmake/M.pc.in ${PROJECT_BINARY_DIR}/M.pc @ONLY)
   install(FILES ${PROJECT_BINARY_DIR}/M.pc DESTINATION ${pc_folder})
 endfunction()

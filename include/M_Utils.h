@@ -4,19 +4,19 @@
 ///
 /// Contents
 ///   Error codes
-///   Life cycle          M_Birth M_Death M_GetGlobals M_SetGlobals
-///   Fast tables         M_PrepareFTrig M_UnprepareFTrig M_PrepareFCMD M_UnprepareFCMD
-///   Fixed point         M_FixMul M_FixDiv M_Fix24Mul M_Fix24Ratio
-///   Bits and powers     M_LeadingZeros M_TrailingZeros M_RoundUpToPowerOf2 M_RoundDownToPowerOf2
-///                       M_BitsUsed M_IsTopTwoBitsSame
-///   Overflow            M_AddWouldOverflow M_MulWouldOverflow M_UMulWouldOverflow
-///   GCD and LCM         M_SignedGCD M_UnsignedGCD M_SignedLCM M_UnsignedLCM
-///   Rounding            M_RoundToNearestMult M_RoundDouble M_RoundDoubleSafe M_RoundDouble64
-///   M_fmod Ratio arithmetic    M_ReduceRatio M_AddRatio M_SubRatio M_MulRatio M_DivRatio
-///   M_RecipRatio
-///                       M_CompareRatio M_MinRatio M_MaxRatio M_FpLong2Ratio
-///   Ratio conversion    M_ConvRatio M_ShortConvRatio M_ClipRatio M_ClipRatioToSpan
-///                       M_ClipSpanToSpan
+///   Life cycle        M_Birth M_Death M_GetGlobals M_SetGlobals
+///   Fast tables       M_PrepareFTrig M_UnprepareFTrig M_PrepareFCMD M_UnprepareFCMD
+///   Fixed point       M_FixMul M_FixDiv M_Fix24Mul M_Fix24Ratio
+///   Bits and powers   M_LeadingZeros M_TrailingZeros M_RoundUpToPowerOf2 M_RoundDownToPowerOf2
+///                     M_BitsUsed M_IsTopTwoBitsSame
+///   Overflow          M_AddWouldOverflow M_MulWouldOverflow M_UMulWouldOverflow
+///   GCD and LCM       M_SignedGCD M_UnsignedGCD M_SignedLCM M_UnsignedLCM
+///   Rounding          M_RoundToNearestMult M_RoundDouble M_RoundDoubleSafe M_RoundDouble64
+///                     M_fmod
+///   Ratio arithmetic  M_ReduceRatio M_AddRatio M_SubRatio M_MulRatio M_DivRatio M_RecipRatio
+///                     M_CompareRatio M_MinRatio M_MaxRatio M_FpLong2Ratio
+///   Ratio conversion  M_ConvRatio M_ShortConvRatio M_ClipRatio M_ClipRatioToSpan
+///                     M_ClipSpanToSpan
 ///
 /// Conventions: a function that can fail returns a 32-bit code, 0 for success. Pointers must not be
 /// null unless their comment says so; flags that only inform (`unsigned char*`) may always be null.
@@ -149,9 +149,9 @@ typedef int32_t M_Fix24;
 
 extern "C" {
 
-/// a x b. Exact while the operands have 16 trailing zero bits between them to spare; otherwise each
-/// first loses its low 8 bits (towards minus infinity), so 1.0 x 0x00000001 is 0. A product of the
-/// wrong sign gives 0x80000000; one that wraps to the right sign is returned. Never reports.
+/// a x b. Exact where the operands have 17 trailing zero bits between them; otherwise each first
+/// loses its low 8 bits (towards minus infinity), so 1.0 x 0x00000001 is 0. A product of the wrong
+/// sign gives 0x80000000; one that wraps to the right sign is returned. Never reports.
 M_Fixed M_FixMul(M_Fixed a, M_Fixed b);
 
 /// a / b, truncated; large dividends drop low bits of the divisor. A zero divisor (also after the
@@ -265,8 +265,8 @@ int32_t M_ReduceRatio(const M_Ratio* in, M_Ratio* out, unsigned char* reduced);
 //                              1 permits M_DivRatio to halve a divisor whose den is 2^31 or more
 //                         out: 0 exact, 1 overflow, 2 approximated; overflow is not reported and
 //                              the result is 0
-//   all bits set          (unsigned char*)-1, never dereferenced: approximates unasked and reports
-//                         only if even that fails
+//   all bits set          (unsigned char*)-1, never dereferenced: approximates and halves unasked,
+//                         and reports only if even that fails
 // After every failure out is 0/0. out may be an operand. A zero denominator is always reported,
 // its code returned and the status byte left at 0.
 

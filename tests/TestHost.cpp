@@ -4,7 +4,6 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <new>
 
 #include "U.h"
 #include "XLOG.h"
@@ -55,7 +54,7 @@ U_Handle U_AllocateHandleQuiet(size_t bytes) {
 }
 
 void U_FreeHandle(U_Handle handle) {
-  Note("free");
+  Note("%s", "free");
   std::free(*handle);
   delete handle;
   --host.handles;
@@ -110,13 +109,3 @@ void XLOG_Log(int32_t level, const char* component, const char* event, const cha
 }
 
 }  // extern "C"
-
-void* U_MemTrackedObject::TrackedNew(size_t bytes, bool) {
-  Note("new %zu", bytes);
-  return ::operator new(bytes);
-}
-
-void U_MemTrackedObject::TrackedDelete(void* block) {
-  Note("delete");
-  ::operator delete(block);
-}

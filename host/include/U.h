@@ -85,10 +85,16 @@ class U_Allocator {
     return static_cast<T*>(U_MemTrackedObject::TrackedNew(count * sizeof(T), false));
   }
   void deallocate(T* block, size_t) { U_MemTrackedObject::TrackedDelete(block); }
-
-  friend bool operator==(const U_Allocator&, const U_Allocator&) { return true; }
-  friend bool operator!=(const U_Allocator&, const U_Allocator&) { return false; }
 };
+
+template <class T, class Other>
+bool operator==(const U_Allocator<T>&, const U_Allocator<Other>&) {
+  return true;
+}
+template <class T, class Other>
+bool operator!=(const U_Allocator<T>&, const U_Allocator<Other>&) {
+  return false;
+}
 
 // ---------------------------------------------------------------------------------------------
 // What this stand-in offers beyond that
@@ -119,8 +125,9 @@ struct U_Report {
   const char* text;
 };
 
-/// Receives every report, on the thread that reports, while it is reported. A null callback stands
-/// for a line on standard error.
+/// Receives every report, on the thread that reports, while it is reported; it may report in turn.
+/// A null callback stands for a line on standard error. A callback that was replaced may still be
+/// running on another thread.
 typedef void (*U_ReportCallback)(void* context, const U_Report* report);
 void U_SetReportCallback(U_ReportCallback callback, void* context);
 

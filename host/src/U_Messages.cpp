@@ -28,22 +28,43 @@ struct Header {
 };
 
 std::mutex folderMutex;
-std::string chosenFolder;  // empty: the folder beside the library
 
-// The folder of the translations, relative to the file that holds this code, so that an installed
-// tree can be moved.
-std::string OwnFolder() {
-  Dl_info info;
-  if (dladdr(reinterpret_cast<const void*>(&OwnFolder), &info) == 0) return {};
-  std::error_code error;
-  const auto file = std::filesystem::canonical(info.dli_fname, error);
-  return error ? std::string() : (file.parent_path() / U_RELATIVE_LOCALE_FOLDER).string();
+// The strings here are never destroyed: reports may still come while the program ends.
+
+// Empty: the folder beside the library.
+std::string& ChosenFolder() {
+  static std::string& folder = *new std::string;
+  return folder;
 }
 
+// The file that holds this code: the library or, where that is static, the program.
+std::filesystem::path OwnFile() {
+#ifdef U_IS_STATIC
+  return "/proc/self/exe";
+#else
+  Dl_info info;
+  const bool isKnown = dladdr(reinterpret_cast<const void*>(&OwnFile), &info) != 0;
+  return isKnown ? info.dli_fname : "";
+#endif
+}
+
+// The folder of the translations. It is found by its place relative to this code, so that an
+// installed tree can be moved.
+const std::string& OwnFolder() {
+  static const std::string& folder = *[] {
+    std::error_code error;
+    const auto file = std::filesystem::canonical(OwnFile(), error);
+    return error ? new std::string : new std::string(file.parent_path() / U_RELATIVE_LOCALE_FOLDER);
+  }();
+  return folder;
+}
+
+// The path may be relative to the folder in which the program starts, which it may leave.
+[[maybe_unused]] const std::string& folderFoundAtStart = OwnFolder();
+
 void BindCatalogue(const char* component) {
-  static const std::string ownFolder = OwnFolder();
   const std::lock_guard lock(folderMutex);
-  const std::string& folder = chosenFolder.empty() ? ownFolder : chosenFolder;
+  const std::string& folder = ChosenFolder().empty() ? OwnFolder() : ChosenFolder();
   if (folder.empty()) return;
   const char* const bound = bindtextdomain(component, nullptr);
   if (!bound || folder != bound) bindtextdomain(component, folder.c_str());
@@ -92,7 +113,7 @@ const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t, int32
 
 void U_SetMessageFolder(const char* folder) {
   const std::lock_guard lock(folderMutex);
-  chosenFolder = folder ? folder : "";
+  ChosenFolder() = folder ? folder : "";
 }
 
 }  // extern "C"

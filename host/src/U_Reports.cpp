@@ -1,6 +1,7 @@
 // Reports and log lines: the thread's buffer and last error, and the callbacks that receive them.
 
 #include <cstdio>
+#include <cstring>
 #include <mutex>
 #include <new>
 
@@ -64,10 +65,17 @@ class Sink {
 constinit Sink<U_ReportCallback> reportSink(PrintReport);
 constinit Sink<U_LogCallback> logSink(PrintLogLine);
 
+// The callback may do something that reports in turn; afterwards the thread's message and last
+// error are this report's again.
 void Send(uint32_t id, int32_t severity, int32_t hostError, const char* text) {
-  lastError = hostError != 0 ? hostError : static_cast<int32_t>(id);
-  const U_Report report = {id, severity, hostError, text ? text : ""};
+  char message[U_BUFFER_BYTES];
+  std::memcpy(message, buffer, sizeof message);
+  const int32_t error = hostError != 0 ? hostError : static_cast<int32_t>(id);
+  const U_Report report = {id, severity, hostError, text == buffer ? message : text ? text : ""};
+  lastError = error;
   reportSink.Call(&report);
+  lastError = error;
+  std::memcpy(buffer, message, sizeof message);
 }
 
 }  // namespace

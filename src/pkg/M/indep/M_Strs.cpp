@@ -61,8 +61,8 @@ Mp_StrEntry M_G_ztab[] = {
     {nullptr, {kAllOnes, kAllOnes, 0}},
 };
 
-const Mp_StrHeader M_G_zhdr = {"M", std::size(M_G_ztab), M_G_ztab, 0};
-const Mp_StrRef M_G_zref = {&M_G_zhdr, 0};
+Mp_StrHeader M_G_zhdr = {"M", std::size(M_G_ztab), M_G_ztab, 0};
+Mp_StrRef M_G_zref = {&M_G_zhdr, 0};
 
 }  // extern "C"
 

@@ -70,7 +70,7 @@ static_assert(sizeof(Mp_StrHeader) == 32 && offsetof(Mp_StrHeader, count) == 8);
 static_assert(offsetof(Mp_StrHeader, table) == 16 && offsetof(Mp_StrHeader, reserved) == 24);
 
 struct Mp_StrRef {
-  const Mp_StrHeader* header;
+  Mp_StrHeader* header;
   uint64_t reserved;
 };
 static_assert(sizeof(Mp_StrRef) == 16 && offsetof(Mp_StrRef, reserved) == 8);
@@ -78,8 +78,8 @@ static_assert(sizeof(Mp_StrRef) == 16 && offsetof(Mp_StrRef, reserved) == 8);
 #pragma GCC visibility push(default)
 extern "C" {
 extern Mp_StrEntry M_G_ztab[43];
-extern const Mp_StrHeader M_G_zhdr;
-extern const Mp_StrRef M_G_zref;
+extern Mp_StrHeader M_G_zhdr;
+extern Mp_StrRef M_G_zref;
 }
 #pragma GCC visibility pop
 

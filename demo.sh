@@ -1,0 +1,11 @@
+#!/bin/sh
+# Installs what is missing, builds, and prints the time sheets of the sample compositions.
+set -eu
+cd "$(dirname "$0")"
+. scripts/packages.sh
+
+need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libbenchmark-dev pkg-config
+build_preset release --target comp catalogues
+echo
+build/release/bin/comp examples/comp/samples/film.json examples/comp/samples/broadcast.json \
+  examples/comp/samples/sound.json

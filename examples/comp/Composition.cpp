@@ -1,0 +1,158 @@
+#include "Composition.h"
+
+#include <charconv>
+#include <cmath>
+#include <initializer_list>
+#include <istream>
+#include <nlohmann/json.hpp>
+#include <optional>
+
+namespace comp {
+namespace {
+
+using Json = nlohmann::json;
+
+// An object of the file that knows where it stands, so that every complaint can say so.
+class Fields {
+ public:
+  Fields(const Json& json, std::string place, std::initializer_list<const char*> known)
+      : json_(json), place_(std::move(place)) {
+    if (!json.is_object()) Complain("is not an object");
+    for (const auto& [key, value] : json.items()) {
+      bool isKnown = false;
+      for (const char* name : known) isKnown |= key == name;
+      if (!isKnown) ComplainAbout(key, "is not a field this program knows");
+    }
+  }
+
+  [[noreturn]] void Complain(const std::string& what) const {
+    throw InputError(place_ + " " + what + ".");
+  }
+
+  [[noreturn]] void ComplainAbout(const std::string& field, const std::string& what) const {
+    throw InputError(place_ + ", field \"" + field + "\": " + what + ".");
+  }
+
+  bool Has(const char* field) const { return json_.contains(field); }
+
+  const Json& Get(const char* field) const {
+    if (!Has(field)) ComplainAbout(field, "is missing");
+    return json_.at(field);
+  }
+
+  std::string Name() const {
+    const Json& value = Get("name");
+    if (!value.is_string() || value.get<std::string>().empty())
+      ComplainAbout("name", "is not a text");
+    return value;
+  }
+
+  int32_t Whole(const char* field) const {
+    const Json& value = Get(field);
+    if (!value.is_number_integer()) ComplainAbout(field, value.dump() + " is not a whole number");
+    const bool fits = value.is_number_unsigned() ? value.get<uint64_t>() <= INT32_MAX
+                                                 : value.get<int64_t>() >= INT32_MIN;
+    if (!fits) ComplainAbout(field, value.dump() + " has more than 32 bits");
+    return value;
+  }
+
+  // A positive ratio: "30000/1001", 25, "25", 23.976 or "23.976".
+  GivenRatio Ratio(const char* field, bool isFrameRate) const {
+    const Json& value = Get(field);
+    if (value.is_number()) return FromNumber(field, value.dump(), isFrameRate);
+    if (!value.is_string()) ComplainAbout(field, "is neither a number nor a ratio");
+    const std::string text = value;
+    const size_t slash = text.find('/');
+    if (slash == std::string::npos) return FromNumber(field, text, isFrameRate);
+    const auto num = Parse<int32_t>(text.substr(0, slash));
+    const auto den = Parse<int32_t>(text.substr(slash + 1));
+    if (!num || !den) ComplainAbout(field, "\"" + text + "\" is not a ratio of 32-bit numbers");
+    if (*den == 0) ComplainAbout(field, "\"" + text + "\" has a zero denominator");
+    if (*num <= 0 || *den < 0) ComplainAbout(field, "\"" + text + "\" is not greater than zero");
+    return {{*num, static_cast<uint32_t>(*den)}, {}};
+  }
+
+ private:
+  template <class T>
+  static std::optional<T> Parse(const std::string& text) {
+    T value;
+    const char* const end = text.data() + text.size();
+    const auto [rest, error] = std::from_chars(text.data(), end, value);
+    if (error != std::errc() || rest != end) return {};
+    return value;
+  }
+
+  GivenRatio FromNumber(const char* field, const std::string& text, bool isFrameRate) const {
+    const auto value = Parse<double>(text);
+    if (!value || !std::isfinite(*value)) ComplainAbout(field, "\"" + text + "\" is not a number");
+    if (*value <= 0) ComplainAbout(field, text + " is not greater than zero");
+    M_Ratio ratio;
+    unsigned char isOutOfRange;
+    M_FpLong2Ratio(&ratio, &isOutOfRange, *value);
+    if (isOutOfRange || ratio.num == 0) ComplainAbout(field, text + " is out of range");
+    if (isFrameRate) {
+      // 23.976, 29.97 and their like stand for thousands over 1001, which differ by a millionth.
+      const int32_t nominal = M_RoundDouble(*value * 1.001);
+      const double broadcast = nominal * 1000.0 / 1001.0;
+      if (nominal < 1000 && std::abs(*value - broadcast) < 1.5e-6 * *value) {
+        ratio = {nominal * 1000, 1001};
+      }
+    }
+    return {ratio, ratio.num / static_cast<double>(ratio.den) == *value ? "" : text};
+  }
+
+  const Json& json_;
+  std::string place_;
+};
+
+Layer ReadLayer(const Json& json, const std::string& fileName, size_t number) {
+  std::string place = fileName + ": layer " + std::to_string(number);
+  if (json.is_object() && json.contains("name") && json["name"].is_string()) {
+    place += " (\"" + json["name"].get<std::string>() + "\")";
+  }
+  const Fields fields(json, place, {"name", "sourceRate", "timeBase", "in", "out", "stretch"});
+  Layer layer;
+  layer.name = fields.Name();
+  layer.hasSourceRate = fields.Has("sourceRate");
+  if (layer.hasSourceRate && fields.Has("timeBase")) {
+    fields.ComplainAbout("timeBase", "stands beside a \"sourceRate\"");
+  }
+  layer.timeBase =
+      layer.hasSourceRate ? fields.Ratio("sourceRate", true) : fields.Ratio("timeBase", false);
+  layer.in = fields.Whole("in");
+  layer.out = fields.Whole("out");
+  if (layer.out < layer.in) fields.ComplainAbout("out", "lies before \"in\"");
+  if (int64_t{layer.out} - layer.in > INT32_MAX) {
+    fields.ComplainAbout("out", "lies more than 32 bits behind \"in\"");
+  }
+  layer.stretch = fields.Has("stretch") ? fields.Ratio("stretch", false) : GivenRatio{{1, 1}, {}};
+  return layer;
+}
+
+}  // namespace
+
+Composition ReadComposition(std::istream& in, const std::string& fileName) {
+  Json json;
+  try {
+    json = Json::parse(in);
+  } catch (const Json::parse_error& error) {
+    throw InputError(fileName + ": is not JSON, or ends too soon (at byte " +
+                     std::to_string(error.byte) + ").");
+  }
+  const Fields fields(json, fileName + ": composition",
+                      {"name", "frameRate", "start", "duration", "layers"});
+  Composition composition;
+  composition.name = fields.Name();
+  composition.frameRate = fields.Ratio("frameRate", true);
+  composition.start = fields.Whole("start");
+  composition.duration = fields.Whole("duration");
+  if (composition.duration <= 0) fields.ComplainAbout("duration", "is not greater than zero");
+  const Json& layers = fields.Get("layers");
+  if (!layers.is_array()) fields.ComplainAbout("layers", "is not a list");
+  for (const Json& layer : layers) {
+    composition.layers.push_back(ReadLayer(layer, fileName, composition.layers.size() + 1));
+  }
+  return composition;
+}
+
+}  // namespace comp

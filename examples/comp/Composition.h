@@ -1,0 +1,50 @@
+/// \file
+/// A composition as its file describes it.
+#ifndef COMP_COMPOSITION_H
+#define COMP_COMPOSITION_H
+
+#include <cstdint>
+#include <iosfwd>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "M_Utils.h"
+
+namespace comp {
+
+/// A file that cannot be used. The text is a sentence that names the file, the layer and the field.
+class InputError : public std::runtime_error {
+ public:
+  using std::runtime_error::runtime_error;
+};
+
+/// A ratio of the file. Decimals are approximated; `given` is then the decimal, else empty.
+struct GivenRatio {
+  M_Ratio ratio;
+  std::string given;
+};
+
+struct Layer {
+  std::string name;
+  bool hasSourceRate;   ///< The time base is the frames of a source rate.
+  GivenRatio timeBase;  ///< Seconds a unit, or with a source rate units a second.
+  int32_t in;           ///< First unit.
+  int32_t out;          ///< The unit behind the last.
+  GivenRatio stretch;   ///< Seconds on screen a second of the source.
+};
+
+struct Composition {
+  std::string name;
+  GivenRatio frameRate;  ///< Frames a second.
+  int32_t start;         ///< First frame.
+  int32_t duration;      ///< Frames.
+  std::vector<Layer> layers;
+};
+
+/// Reads a composition file (JSON). Throws InputError.
+Composition ReadComposition(std::istream& in, const std::string& fileName);
+
+}  // namespace comp
+
+#endif  // COMP_COMPOSITION_H

@@ -1,0 +1,123 @@
+#include "Sheet.h"
+
+#include <numeric>
+
+namespace comp {
+namespace {
+
+using Operation = int32_t (*)(const M_Ratio*, const M_Ratio*, M_Ratio*, unsigned char*);
+
+constexpr Value kOverflown = {{0, 0}, Accuracy::kOverflow};
+
+Accuracy Worse(Accuracy a, Accuracy b) { return a < b ? b : a; }
+
+// Exactly, or with a report; then approximately. What goes in approximated comes out so.
+Value Calculate(Operation operation, const Value& a, const Value& b) {
+  const Accuracy given = Worse(a.accuracy, b.accuracy);
+  if (given == Accuracy::kOverflow) return kOverflown;
+  Value result = {{}, given};
+  if (operation(&a.ratio, &b.ratio, &result.ratio, nullptr) == 0) return result;
+  unsigned char status = 2;
+  if (operation(&a.ratio, &b.ratio, &result.ratio, &status) != 0 || status != 2) return kOverflown;
+  result.accuracy = Accuracy::kApproximated;
+  return result;
+}
+
+// A sum that tells whether its operands had to be reduced: then it is not over their least common
+// denominator.
+Value Add(const Value& a, const Value& b) {
+  Value sum = Calculate(M_AddRatio, a, b);
+  const uint64_t common = std::lcm(uint64_t{a.ratio.den}, uint64_t{b.ratio.den});
+  const bool isPlain = a.ratio.num == 0 || b.ratio.num == 0 || sum.ratio.den == common;
+  if (sum.accuracy == Accuracy::kExact && !isPlain) sum.accuracy = Accuracy::kReduced;
+  return sum;
+}
+
+class SheetMaker {
+ public:
+  explicit SheetMaker(const Composition& composition)
+      : composition_(composition), frameRate_{composition.frameRate.ratio, Accuracy::kExact} {
+    M_RecipRatio(&frameRate_.ratio, &frame_.ratio, nullptr);
+    start_ = Calculate(M_MulRatio, Units(composition.start), frame_);
+    duration_ = Calculate(M_MulRatio, Units(composition.duration), frame_);
+  }
+
+  Sheet Make(ReportCollector& collector) const {
+    Sheet sheet = {
+        composition_.name, composition_.frameRate, InFrames(start_), InFrames(duration_), {}, {}};
+    Value sum = {{0, 1}, Accuracy::kExact};
+    for (const Layer& layer : composition_.layers) {
+      collector.SetLayer(layer.name);
+      Row row = MakeRow(layer);
+      sum = Add(sum, row.duration.seconds);
+      row.runningSum = sum;
+      sheet.rows.push_back(std::move(row));
+    }
+    sheet.reports = collector.Reports();
+    return sheet;
+  }
+
+ private:
+  static Value Units(int32_t count) { return {{count, 1}, Accuracy::kExact}; }
+
+  Time InFrames(const Value& seconds) const {
+    const Value frames = Calculate(M_MulRatio, seconds, frameRate_);
+    if (frames.accuracy == Accuracy::kOverflow) return {seconds, {0, false, true}};
+    M_Ratio whole;
+    unsigned char isExact, hasOverflowed;
+    M_ConvRatio(&frames.ratio, 1, &whole, &isExact, &hasOverflowed);
+    const bool isApproximated = frames.accuracy == Accuracy::kApproximated;
+    return {seconds, {whole.num, isExact && !isApproximated, hasOverflowed != 0}};
+  }
+
+  // Both ends are held to the composition by themselves: M_ClipSpanToSpan would end every layer
+  // where the composition ends.
+  Value Clip(const Value& seconds) const {
+    const Accuracy accuracy = Worse(seconds.accuracy, Worse(start_.accuracy, duration_.accuracy));
+    Value clipped = {{}, accuracy};
+    const bool fails =
+        accuracy == Accuracy::kOverflow ||
+        M_ClipRatioToSpan(&seconds.ratio, &start_.ratio, &duration_.ratio, &clipped.ratio);
+    return fails ? kOverflown : clipped;
+  }
+
+  Row MakeRow(const Layer& layer) const {
+    Row row;
+    row.name = layer.name;
+    row.timeBase = layer.timeBase;
+    row.hasSourceRate = layer.hasSourceRate;
+    row.unit = {layer.timeBase.ratio, Accuracy::kExact};
+    if (layer.hasSourceRate) M_RecipRatio(&row.unit.ratio, &row.unit.ratio, nullptr);
+    row.stretch = layer.stretch;
+    row.inUnits = layer.in;
+    row.outUnits = layer.out;
+    row.in = InFrames(Calculate(M_MulRatio, Units(layer.in), row.unit));
+    row.out = InFrames(Calculate(M_MulRatio, Units(layer.out), row.unit));
+    row.duration = InFrames(Calculate(M_MulRatio, Units(layer.out - layer.in), row.unit));
+    row.clippedIn = InFrames(Clip(row.in.seconds));
+    row.clippedOut = InFrames(Clip(row.out.seconds));
+    row.clippedDuration =
+        InFrames(Calculate(M_SubRatio, row.clippedOut.seconds, row.clippedIn.seconds));
+    const M_Ratio& stretch = layer.stretch.ratio;
+    row.sourceDuration = row.clippedDuration.seconds;
+    if (stretch.num != 1 || stretch.den != 1) {
+      row.sourceDuration = Calculate(M_DivRatio, row.sourceDuration, {stretch, Accuracy::kExact});
+    }
+    return row;
+  }
+
+  const Composition& composition_;
+  Value frameRate_;
+  Value frame_ = {{}, Accuracy::kExact};
+  Value start_;
+  Value duration_;
+};
+
+}  // namespace
+
+Sheet MakeSheet(const Composition& composition) {
+  ReportCollector collector;
+  return SheetMaker(composition).Make(collector);
+}
+
+}  // namespace comp

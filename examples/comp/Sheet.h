@@ -1,0 +1,65 @@
+/// \file
+/// The time sheet of a composition: where each layer lies, exactly and in frames.
+#ifndef COMP_SHEET_H
+#define COMP_SHEET_H
+
+#include <string>
+#include <vector>
+
+#include "Composition.h"
+#include "M_Utils.h"
+#include "Reports.h"
+
+namespace comp {
+
+/// How a value came about.
+enum class Accuracy {
+  kExact,
+  kReduced,       ///< Exact, with operands reduced so that it fits.
+  kApproximated,  ///< The exact value does not fit; the nearest ratio stands for it.
+  kOverflow,      ///< Not even that fits; the value is 0/0.
+};
+
+struct Value {
+  M_Ratio ratio;
+  Accuracy accuracy;
+};
+
+/// A time in whole frames of the composition.
+struct Frames {
+  int32_t count;
+  bool isExact;
+  bool hasOverflowed;
+};
+
+struct Time {
+  Value seconds;
+  Frames frames;
+};
+
+struct Row {
+  std::string name;
+  Value unit;  ///< Seconds a unit of the layer's time base.
+  GivenRatio timeBase;
+  bool hasSourceRate;
+  GivenRatio stretch;
+  int32_t inUnits, outUnits;
+  Time in, out, duration;
+  Time clippedIn, clippedOut, clippedDuration;  ///< Held to the composition.
+  Value sourceDuration;                         ///< Seconds of the source that are seen.
+  Value runningSum;                             ///< Seconds of this layer and those above it.
+};
+
+struct Sheet {
+  std::string name;
+  GivenRatio frameRate;
+  Time start, duration;
+  std::vector<Row> rows;
+  std::vector<Report> reports;  ///< What the library reported on the way.
+};
+
+Sheet MakeSheet(const Composition& composition);
+
+}  // namespace comp
+
+#endif  // COMP_SHEET_H

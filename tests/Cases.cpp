@@ -1,0 +1,105 @@
+#include "Cases.h"
+
+#include <fstream>
+#include <map>
+
+namespace {
+
+std::map<std::string, std::string (*)(Arguments&)>& Operations() {
+  static std::map<std::string, std::string (*)(Arguments&)> operations;
+  return operations;
+}
+
+// An expected result with its numbers written as results are.
+std::string Normal(const std::string& expected) {
+  std::istringstream words(expected);
+  std::string normal, word;
+  while (words >> word) {
+    const std::string digits = word.substr(word[0] == '-');
+    const bool isNumber =
+        digits.find_first_not_of("-0123456789abcdefABCDEFxmin/") == std::string::npos &&
+        (digits.rfind("0x", 0) == 0 || digits.rfind("m", 0) == 0);
+    const size_t slash = word.find('/');
+    const bool isRatio = slash != std::string::npos && word.find_first_of("0123456789") < slash + 2;
+    normal += ' ' + (isRatio ? ToText(ToRatio(word)) : isNumber ? ToText(ToInteger(word)) : word);
+  }
+  return normal;
+}
+
+class CasesTest : public HostTest, public ::testing::WithParamInterface<const char*> {};
+INSTANTIATE_TEST_SUITE_P(, CasesTest,
+                         ::testing::Values("approximation", "bits", "clip", "fixed", "life",
+                                           "ratio", "report", "rounding", "tables"),
+                         [](const auto& file) { return std::string(file.param); });
+
+TEST_P(CasesTest, GiveTheirResults) {
+  std::ifstream file(std::string(TESTS_FOLDER "/cases/").append(GetParam()).append(".txt"));
+  std::string line;
+  int cases = 0;
+  for (int number = 1; std::getline(file, line); ++number) {
+    SCOPED_TRACE(std::string(GetParam())
+                     .append(".txt:")
+                     .append(std::to_string(number))
+                     .append(": ")
+                     .append(line));
+    line = line.substr(0, line.find('#'));
+    const size_t equals = line.find('=');
+    if (equals == std::string::npos) continue;
+    Arguments arguments(line.substr(0, equals));
+    const auto operation = Operations().find(arguments.Word());
+    ASSERT_NE(operation, Operations().end());
+    EXPECT_EQ(operation->second(arguments), Normal(line.substr(equals + 1)));
+    ++cases;
+  }
+  EXPECT_GT(cases, 10) << "the table could not be read";
+}
+
+}  // namespace
+
+int64_t ToInteger(const std::string& text) {
+  if (text[0] == '-') return -ToInteger(text.substr(1));
+  if (text == "min") return INT32_MIN;
+  if (text == "max") return INT32_MAX;
+  return static_cast<int64_t>(std::stoull(text, nullptr, 0));
+}
+
+M_Ratio ToRatio(const std::string& text) {
+  const size_t slash = text.find('/');
+  return {static_cast<int32_t>(ToInteger(text.substr(0, slash))),
+          static_cast<uint32_t>(ToInteger(text.substr(slash + 1)))};
+}
+
+std::string ToText(const M_Ratio& r) { return ToText(r.num).append("/").append(ToText(r.den)); }
+
+std::string Outcome(int32_t code) {
+  std::ostringstream text;
+  if (code != 0) text << ' ' << std::hex << code;
+  const char* separator = " ";
+  for (const std::string& call : host.Take()) {
+    text << separator << call;
+    separator = " | ";
+  }
+  return text.str();
+}
+
+std::string Arguments::Word() {
+  std::string word;
+  words_ >> word;
+  EXPECT_NE(word, "") << "an argument is missing";
+  return word.empty() ? "0" : word;
+}
+
+std::string Aliased(const std::vector<M_Ratio>& operands,
+                    const std::function<std::string(const M_Ratio*, M_Ratio*)>& call) {
+  std::string first;
+  for (size_t alias = 0; alias <= operands.size(); ++alias) {
+    std::vector<M_Ratio> copies = operands;
+    copies.push_back({77, 77});
+    const std::string result = call(copies.data(), &copies[operands.size() - alias]);
+    if (alias == 0) first = result;
+    EXPECT_EQ(result, first) << "with the output in operand " << operands.size() - alias;
+  }
+  return first;
+}
+
+Operation::Operation(const char* name, std::string (*run)(Arguments&)) { Operations()[name] = run; }

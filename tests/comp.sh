@@ -1,0 +1,58 @@
+#!/bin/sh
+# Runs the comp example as a user does: its samples, its languages, and files that cannot be used.
+# Usage: comp.sh PROGRAM SOURCE_FOLDER
+set -eu
+program=$1
+samples=$2/examples/comp/samples
+tests=$2/tests
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+
+fail() {
+  echo "$*"
+  exit 1
+}
+
+sheets() {
+  LC_ALL=C "$program" "$@" "$samples/film.json" "$samples/broadcast.json" "$samples/sound.json" "$tests/comp_odd.json"
+}
+sheets >"$work/sheets"
+diff "$tests/comp_sheets.txt" "$work/sheets" || fail "< the sheets as they should be, > as they are"
+# The same values, without the words around them.
+sheets --json >"$work/json"
+for word in '"id": "0x110010"' '"approximates": "29.97"' '"accuracy": "overflow"' '"ratio": "56521597/15000"'; do
+  grep -q "$word" "$work/json" || fail "--json does not say $word"
+done
+"$program" --help | grep -q '^Usage: comp' || fail "--help does not help"
+
+# What cannot be used: exit status 2, one sentence, nothing printed.
+refuse() {
+  sentence=$1
+  shift
+  status=0
+  "$program" "$@" >"$work/out" 2>"$work/err" || status=$?
+  [ "$status" = 2 ] || fail "exit status $status for $*: $sentence"
+  [ ! -s "$work/out" ] || fail "something was printed for $*"
+  [ "$(cat "$work/err")" = "comp: $sentence" ] || fail "got:      $(cat "$work/err")
+expected: comp: $sentence"
+}
+refuse "$work/none.json: cannot be read." "$work/none.json"
+refuse "no file is given; see comp --help."
+refuse "--fast is not an option; see comp --help." --fast "$samples/film.json"
+while IFS='|' read -r edit sentence; do
+  sed "$edit" "$tests/comp_base.json" >"$work/bad.json"
+  case $sentence in is*) ;; *) sentence=" $sentence" ;; esac
+  refuse "$work/bad.json: ${sentence# }" "$samples/film.json" "$work/bad.json"
+done <"$tests/comp_errors.txt"
+length=$(wc -c <"$tests/comp_base.json")
+while [ "$length" -gt 5 ]; do
+  length=$((length - 5))
+  head -c "$length" "$tests/comp_base.json" >"$work/cut.json"
+  refuse "$work/cut.json: is not JSON, or ends too soon (at byte $((length + 1)))." "$work/cut.json"
+done
+
+# Needs the catalogues, which are there where msgfmt was.
+if command -v msgfmt >/dev/null; then
+  LC_ALL=C.UTF-8 LANGUAGE=de "$program" "$samples/sound.json" >"$work/german"
+  grep -q 'Überlauf bei der Addition von Verhältnissen' "$work/german" || fail "no German"
+fi

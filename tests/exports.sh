@@ -1,0 +1,24 @@
+#!/bin/sh
+# Compares the names that libM exports, with their version nodes, with those that its headers declare.
+# Usage: exports.sh LIBRARY SOURCE_FOLDER
+set -eu
+library=$1
+source=$2
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+
+# The functions and objects that headers declare at the beginning of a line.
+declared() {
+  sed -nE -e 's/^[A-Za-z_][A-Za-z0-9_ *]*[ *](Mp?_[A-Za-z0-9_]+)\(.*/\1/p' \
+    -e 's/^extern [A-Za-z0-9_ ]*[ *](Mp?_[A-Za-z0-9_]+)(\[[0-9]+\])?;.*/\1/p' "$@"
+}
+
+{
+  declared "$source"/include/*.h | sed 's/$/@@M_1/'
+  declared "$source"/src/pkg/M/indep/Mp_*.h | sed 's/$/@@M_PRIVATE/'
+} | sort >"$work/declared"
+nm -D --defined-only --with-symbol-versions "$library" | awk '$2 != "A" { print $3 }' | sort >"$work/exported"
+
+[ "$(wc -l <"$work/declared")" -gt 60 ] || { echo "the headers could not be read"; exit 1; }
+diff "$work/declared" "$work/exported" || { echo "< declared, > exported"; exit 1; }
+readelf -d "$library" | grep -q 'SONAME.*\[libM\.so\.1\]' || { echo "the SONAME is not libM.so.1"; exit 1; }

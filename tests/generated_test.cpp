@@ -1,0 +1,161 @@
+// Generated operands against wide integer arithmetic and the standard library.
+
+#include <bit>
+#include <cmath>
+#include <numeric>
+
+#include "Cases.h"
+
+namespace {
+
+__extension__ typedef __int128 Wide;
+
+// xorshift64*: the same operands on every machine.
+class Generator {
+ public:
+  explicit Generator(uint64_t seed) : state_(seed) {}
+
+  uint32_t Word() {
+    state_ ^= state_ >> 12;
+    state_ ^= state_ << 25;
+    state_ ^= state_ >> 27;
+    return static_cast<uint32_t>(state_ * 0x2545F4914F6CDD1D >> 32);
+  }
+  uint32_t Below(uint32_t limit) { return Word() % limit; }
+
+  // A word of any bit length alike, at times one step from a power of two, at times with zeros at
+  // its end: what limits and overflow predictions turn on.
+  uint32_t Spread() {
+    const uint32_t bits = Below(33);
+    if (bits == 0) return 0;
+    const uint32_t top = 1u << (bits - 1), random = top | (Word() & (top - 1));
+    const uint32_t kind = Below(5);
+    return kind == 0   ? top + Below(3) - 1
+           : kind == 1 ? random & ~((1u << Below(bits)) - 1)
+                       : random;
+  }
+  int32_t Signed() { return static_cast<int32_t>(Below(2) ? Spread() : 0 - Spread()); }
+  M_Ratio Ratio() {
+    const int32_t num = Signed();
+    return {num, std::max(Spread(), 1u)};
+  }
+
+ private:
+  uint64_t state_;
+};
+
+int Bits(Wide v) { return static_cast<int>(std::bit_width(static_cast<uint64_t>(v < 0 ? -v : v))); }
+int Sign(Wide v) { return (v > 0) - (v < 0); }
+bool IsInt32(Wide v) { return v == static_cast<int32_t>(v); }
+
+TEST(Generated, GreatestCommonDivisors) {
+  Generator generator(1);
+  for (int i = 0; i < 300000; ++i) {
+    const uint32_t a = generator.Spread(), b = generator.Spread();
+    uint32_t gcd = 99;
+    M_UnsignedGCD(a, b, &gcd);
+    ASSERT_EQ(gcd, b == 0 ? 1 : std::gcd(a, b)) << a << ' ' << b;
+  }
+}
+
+// The sum over the least common denominator, unless a bit length forbids it.
+bool PlainSum(const M_Ratio& a, const M_Ratio& b, M_Ratio* sum) {
+  const uint32_t gcd = std::gcd(a.den, b.den);
+  const Wide scaleA = b.den / gcd, scaleB = a.den / gcd, num = scaleA * a.num + scaleB * b.num;
+  const bool isTooLong =
+      a.den != b.den && (Bits(scaleA) + Bits(a.den) > 32 || Bits(scaleA) + Bits(a.num) > 31 ||
+                         Bits(scaleB) + Bits(b.num) > 31);
+  *sum = {static_cast<int32_t>(num), static_cast<uint32_t>(scaleA * a.den)};
+  if (a.num == 0 || b.num == 0) *sum = a.num == 0 ? b : a;
+  return a.num == 0 || b.num == 0 || (!isTooLong && IsInt32(num));
+}
+
+M_Ratio Lowest(const M_Ratio& r) {
+  const int64_t gcd = std::gcd(int64_t{r.num}, int64_t{r.den});
+  return gcd > INT32_MAX
+             ? r
+             : M_Ratio{static_cast<int32_t>(r.num / gcd), static_cast<uint32_t>(r.den / gcd)};
+}
+
+TEST(Generated, Ratios) {
+  Generator generator(3);
+  for (int i = 0; i < 300000; ++i) {
+    M_Ratio a = generator.Ratio(), b = generator.Ratio(), out = {}, expected = {};
+    if (i % 3 == 0)
+      b = {i % 2 ? b.num : a.num / 2 * 2 + static_cast<int>(generator.Below(2)), a.den};
+    if (i % 3 == 1) {
+      const uint32_t common = generator.Below(0x10000) + 1;
+      a.den = (a.den % 0x1000 + 1) * common, b.den = (b.den % 0x1000 + 1) * common;
+    }
+    SCOPED_TRACE(Text(a, b));
+    bool fits = PlainSum(a, b, &expected) || PlainSum(Lowest(a), Lowest(b), &expected);
+    if (!fits) expected = {0, 0};
+    unsigned char status = 0;
+    ASSERT_EQ(M_AddRatio(&a, &b, &out, &status), 0);
+    ASSERT_EQ(ToText(out), ToText(expected));
+    ASSERT_EQ(status, !fits);
+    const M_Ratio negated = {b.num == INT32_MIN ? b.num : -b.num, b.den};
+    if (b.num != INT32_MIN) {
+      ASSERT_EQ(M_SubRatio(&a, &negated, &out, &status), 0);
+      ASSERT_EQ(ToText(out), ToText(expected));
+    }
+
+    const Wide num = Wide{a.num} * b.num, den = Wide{a.den} * b.den;
+    fits = Bits(a.num) + Bits(b.num) <= 31 && Bits(a.den) + Bits(b.den) <= 32;
+    ASSERT_EQ(M_MulRatio(&a, &b, &out, &(status = 0)), 0);
+    ASSERT_TRUE(!fits || (out.num == num && out.den == den));
+    ASSERT_TRUE(status != 0 || out.den * num == out.num * den);
+    ASSERT_TRUE(status != 0 || fits || num == 0 ||
+                std::gcd(int64_t{out.num}, int64_t{out.den}) == 1);
+
+    if (b.num == INT32_MIN || (a.den | b.den) > INT32_MAX) continue;
+    const Wide difference = Wide{a.num} * b.den - Wide{b.num} * a.den;
+    int32_t order = 99;
+    M_Ratio least = {}, most = {};
+    ASSERT_EQ(
+        M_CompareRatio(&a, &b, &order) | M_MinRatio(&a, &b, &least) | M_MaxRatio(&a, &b, &most), 0);
+    ASSERT_EQ(Sign(order), Sign(difference));
+    ASSERT_EQ(ToText(least), ToText(difference <= 0 ? a : b));
+    ASSERT_EQ(ToText(most), ToText(difference >= 0 ? a : b));
+  }
+}
+
+// The continued fraction of n / d (above 1) up to a numerator of 2^30, in wide integers. Where the
+// next convergent is too large, the closer of the last one and the largest fraction between is
+// taken, the convergent when they are equally close: judged by the distances themselves.
+void Closest(Wide n, Wide d, Wide* num, Wide* den) {
+  Wide h = n / d, k = 1, hp = 1, kp = 0;
+  for (Wide a = d, b = n % d; b != 0;) {
+    const Wide q = a / b, rest = a % b, t = std::min(q, (0x40000000 - hp) / h);
+    const Wide hn = t * h + hp, kn = t * k + kp;
+    const bool isLast = (0x40000000 - hp) / h <= q;
+    const auto distance = [n, d](Wide p, Wide r) { return std::max(n * r - p * d, p * d - n * r); };
+    // |n/d - hn/kn| < |n/d - h/k|, times d k kn.
+    if (isLast && (kn == 0 || distance(hn, kn) * k >= distance(h, k) * kn)) break;
+    hp = h, kp = k, h = hn, k = kn, a = b, b = rest;
+    if (isLast) break;
+  }
+  *num = h, *den = k;
+}
+
+TEST(Generated, Approximations) {
+  Generator generator(4);
+  for (int i = 0; i < 300000; ++i) {
+    // Any single, or a quotient of small numbers, which stops early and is at times half-way.
+    const float any = static_cast<float>(generator.Below(1u << 24) | (1u << 23));
+    const float a = i % 2 ? std::ldexp(any, static_cast<int>(generator.Below(61)) - 54)
+                          : static_cast<float>(generator.Below(5000) + 1) /
+                                static_cast<float>(generator.Spread() | 1);
+    if (a <= 0x1p-30f || a >= 0x1p30f) continue;
+    int exponent;
+    Wide n = static_cast<int64_t>(std::frexp(a, &exponent) * 0x1p24f), d = 1, num, den;
+    (exponent >= 24 ? n : d) <<= std::abs(exponent - 24);
+    if (a >= 1) Closest(n, d, &num, &den);
+    if (a < 1) Closest(d, n, &den, &num);
+    M_Ratio out = {};
+    ASSERT_EQ(M_FpLong2Ratio(&out, nullptr, i % 4 < 2 ? -a : a), 0);
+    ASSERT_TRUE(out.num == (i % 4 < 2 ? -num : num) && out.den == den) << a << ' ' << ToText(out);
+  }
+}
+
+}  // namespace

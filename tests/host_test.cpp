@@ -1,0 +1,236 @@
+// The stand-in host itself, and the library on top of it.
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <atomic>
+#include <clocale>
+#include <cstdlib>
+#include <cstring>
+#include <fstream>
+#include <limits>
+#include <new>
+#include <stdexcept>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "M_Utils.h"
+#include "Mp_Err.h"
+#include "Mp_Life.h"
+#include "Mp_Strs.h"
+#include "U.h"
+#include "XLOG.h"
+
+namespace {
+
+const size_t kTooMuch = std::numeric_limits<size_t>::max() / 2;
+
+// Keeps reports as text for as long as it lives.
+class Reports {
+ public:
+  Reports() { U_SetReportCallback(&Receive, this); }
+  ~Reports() { U_SetReportCallback(nullptr, nullptr); }
+  std::vector<std::string> all;
+
+ private:
+  static void Receive(void* context, const U_Report* report) {
+    char text[3000];
+    std::snprintf(text, sizeof text, "%x %d %d %s", report->id, report->severity, report->hostError,
+                  report->text);
+    static_cast<Reports*>(context)->all.emplace_back(text);
+  }
+};
+
+using Texts = std::vector<std::string>;
+
+// Handles, their bytes, tracked blocks, their bytes.
+std::array<size_t, 4> InUse() {
+  const U_MemoryUse use = U_GetMemoryUse();
+  return {use.handles, use.handleBytes, use.trackedBlocks, use.trackedBytes};
+}
+using Use = std::array<size_t, 4>;
+
+TEST(Handles, AreCountedReclaimedAndFreed) {
+  EXPECT_EQ(InUse(), Use());
+  const U_Handle handle = U_AllocateHandle(0x123, "block", 1000);
+  const U_Handle quiet = U_AllocateHandleQuiet(24);
+  ASSERT_TRUE(handle && *handle && quiet && *quiet);
+  std::memset(*handle, 7, 1000);
+  EXPECT_EQ(InUse(), (Use{2, 1024, 0, 0}));
+  U_ReclaimHandle(handle);
+  U_ReclaimHandle(handle);
+  EXPECT_EQ(*handle, nullptr);
+  EXPECT_EQ(InUse(), (Use{2, 24, 0, 0}));
+  for (const U_Handle each : {handle, quiet, U_Handle()}) U_FreeHandle(each);
+  EXPECT_EQ(InUse(), Use());
+
+  const Reports reports;
+  EXPECT_EQ(U_AllocateHandle(0x123, "block", kTooMuch), nullptr);
+  EXPECT_EQ(U_AllocateHandleQuiet(kTooMuch), nullptr);
+  EXPECT_EQ(reports.all, (Texts{"123 8 4 block"}));
+  EXPECT_EQ(InUse(), Use());
+}
+
+TEST(Handles, ReclaimedTablesAreRebuilt) {
+  U_SetLogCallback([](void*, int32_t, const char*, const char*, const char*) {}, nullptr);
+  ASSERT_EQ(M_Birth(M_SERVICE_TRIG | M_SERVICE_FCMD, nullptr), 0);
+  for (const U_Handle each : {Mp_G.trigTable, Mp_G.fcmTable, Mp_G.fcdTable}) U_ReclaimHandle(each);
+  EXPECT_EQ(InUse(), (Use{3, 0, 0, 0}));
+  const float* sine = nullptr;
+  const unsigned char *mul = nullptr, *div = nullptr;
+  EXPECT_EQ(M_PrepareFTrig(true, false, nullptr, &sine), 0);
+  EXPECT_EQ(M_PrepareFCMD(true, false, nullptr, &mul, &div), 0);
+  EXPECT_EQ(InUse(), (Use{3, 1024 + 2 * 65536, 0, 0}));
+  ASSERT_TRUE(sine && mul && div);
+  EXPECT_TRUE(sine[255] == 1 && mul[128 * 256 + 255] == 128 && div[200 * 256 + 100] == 128);
+  EXPECT_EQ(M_UnprepareFTrig() | M_UnprepareFCMD() | M_Death(), 0);
+  EXPECT_EQ(InUse(), Use());
+  U_SetLogCallback(nullptr, nullptr);
+}
+
+TEST(TrackedMemory, IsCountedAndAligned) {
+  {
+    std::vector<double, U_Allocator<double>> numbers(3);
+    EXPECT_EQ(reinterpret_cast<uintptr_t>(numbers.data()) % alignof(std::max_align_t), 0u);
+    EXPECT_EQ(InUse(), (Use{0, 0, 1, 24}));
+    EXPECT_TRUE(numbers.get_allocator() == U_Allocator<int>());
+  }
+  U_MemTrackedObject::TrackedDelete(nullptr);
+  for (const size_t bytes : {kTooMuch, std::numeric_limits<size_t>::max()}) {
+    EXPECT_THROW(U_MemTrackedObject::TrackedNew(bytes, false), std::bad_alloc);
+    EXPECT_EQ(U_MemTrackedObject::TrackedNew(bytes, true), nullptr);
+  }
+  EXPECT_THROW(U_Allocator<double>().allocate(kTooMuch), std::bad_alloc);
+  EXPECT_EQ(InUse(), Use());
+}
+
+TEST(Reporting, GoesToTheCallbackAndTheLastError) {
+  const Reports reports;
+  std::strcpy(Up_GetThreadLoggingBuffer(), "in the buffer");
+  EXPECT_EQ(Up_ReportError(0x11, 4), 0x11);
+  EXPECT_EQ(Up_GetThreadLastError(), 0x11);
+  EXPECT_EQ(Up_ReportErrString(0x12, 8, "given"), 0x12);
+  EXPECT_EQ(Up_ReportVarkErrString(0x13, 8, -5, nullptr), -5);
+  EXPECT_EQ(Up_GetThreadLastError(), -5);
+  EXPECT_EQ(U_TranslateAndReportException(std::bad_alloc()), 4);
+  EXPECT_EQ(U_TranslateAndReportException(std::runtime_error("odd")), 1);
+  Up_SetThreadLastError(9);
+  EXPECT_EQ(Up_GetThreadLastError(), 9);
+  EXPECT_EQ(reports.all, (Texts{"11 4 0 in the buffer", "12 8 0 given", "13 8 -5 ",
+                                "10000 8 4 std::bad_alloc", "10000 8 1 odd"}));
+}
+
+TEST(Reporting, MayReportInTurn) {
+  Texts received;
+  U_SetReportCallback(
+      [](void* context, const U_Report* report) {
+        auto* const texts = static_cast<Texts*>(context);
+        if (texts->empty()) {
+          texts->emplace_back("outer");
+          Mp_ReportErr(2, 2, 0);
+        }
+        texts->emplace_back(report->text);
+      },
+      &received);
+  Mp_ReportErr(1, 1, 0);
+  EXPECT_EQ(received, (Texts{"outer", "unknown error (2).", "unknown error (1)."}));
+  EXPECT_STREQ(Up_GetThreadLoggingBuffer(), "unknown error (1).");
+  EXPECT_EQ(Up_GetThreadLastError(), 0x110001);
+  U_SetReportCallback(nullptr, nullptr);
+}
+
+TEST(Reporting, GoesToStandardErrorWithoutACallback) {
+  ::testing::internal::CaptureStderr();
+  Up_ReportErrString(0x110018, 8, "text");
+  Up_ReportVarkErrString(0x110014, 8, 12, nullptr);
+  XLOG_Log(10, "M", "Birth", "M Birth");
+  EXPECT_EQ(::testing::internal::GetCapturedStderr(),
+            "[0x110018] text\n[0x110014] host error 12 \nM Birth (10): M Birth\n");
+}
+
+// Each thread sees its own message and last error, whatever the others report.
+TEST(Reporting, IsPerThread) {
+  static std::atomic<int> received;
+  U_SetReportCallback(
+      [](void*, const U_Report* report) {
+        received += report->text == std::string(Up_GetThreadLoggingBuffer());
+      },
+      nullptr);
+  std::vector<std::thread> threads;
+  for (int t = 0; t < 4; ++t) {
+    threads.emplace_back([t] {
+      for (int32_t code = 20000 + t; code < 22000; code += 4) {
+        EXPECT_EQ(Mp_ReportErr(static_cast<int16_t>(code), code, 0), code);
+        EXPECT_EQ(Up_GetThreadLoggingBuffer(),
+                  std::string("unknown error (").append(std::to_string(code)).append(")."));
+        EXPECT_EQ(Up_GetThreadLastError(), 0x110000 + code);
+      }
+    });
+  }
+  for (std::thread& thread : threads) thread.join();
+  U_SetReportCallback(nullptr, nullptr);
+  EXPECT_EQ(received, 2000);
+}
+
+TEST(Services, WideMultiply) {
+  EXPECT_EQ(WideMultiply(INT32_MIN, INT32_MIN), int64_t{1} << 62);
+  EXPECT_EQ(WideMultiply(-3, 5), -15);
+}
+
+const char* Text(int32_t index) { return U_ZLookupLStrCache(M_G_zref.header, index, 0, 0); }
+
+// gettext looks at the environment again once the locale has changed.
+void SetLanguage(const char* language) {
+  setenv("LANGUAGE", language, 1);
+  std::setlocale(LC_ALL, "C");
+  std::setlocale(LC_ALL, "C.UTF-8");
+}
+
+class MessagesTest : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    if (!std::setlocale(LC_ALL, "C.UTF-8")) GTEST_SKIP() << "no locale but C";
+  }
+  void TearDown() override {
+    std::setlocale(LC_ALL, "C");
+    unsetenv("LANGUAGE");
+    U_SetMessageFolder(nullptr);
+  }
+};
+
+TEST_F(MessagesTest, OutsideTheTableAreEmpty) {
+  for (const int32_t index : {-1, 42, 43, 100000}) EXPECT_STREQ(Text(index), "");
+  EXPECT_STREQ(Text(41), "attempt to normalize a homegeneous point");
+}
+
+TEST_F(MessagesTest, AreInTheUsersLanguage) {
+  const char* const kOverflow[][2] = {{"de", "Überlauf bei der Addition von Verhältnissen."},
+                                      {"fr", "dépassement dans une addition de rapports."},
+                                      {"ja", "オーバーフロー: 比の加算。"},
+                                      {"xx", "overflow in ratio addition."}};
+  for (const auto& [language, message] : kOverflow) {
+    SetLanguage(language);
+    const Reports reports;
+    EXPECT_EQ(Mp_ReportErr(16, M_ERR_OVERFLOW, Mp_STR_IN_RATIO_ADDITION), M_ERR_OVERFLOW);
+    EXPECT_EQ(reports.all, (Texts{std::string("110010 8 0 ").append(message)}));
+  }
+}
+
+// The catalogues in the folder of the environment were made for this: each line of the rows beside
+// them is a language and what is to come of its translation.
+TEST_F(MessagesTest, OfBadCataloguesAreNotUsed) {
+  const char* const folder = std::getenv("CATALOGUES");
+  ASSERT_NE(folder, nullptr);
+  U_SetMessageFolder(folder);
+  std::ifstream rows(std::string(folder).append("/rows"));
+  int count = 0;
+  for (std::string language, expected; rows >> language && std::getline(rows >> std::ws, expected);
+       ++count) {
+    SetLanguage(language.c_str());
+    EXPECT_EQ(Text(Mp_STR_OVERFLOW), expected);
+  }
+  EXPECT_GT(count, 10);
+}
+
+}  // namespace

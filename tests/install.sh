@@ -1,0 +1,50 @@
+#!/bin/sh
+# Installs the library, moves the installed tree, and uses it as others would: by CMake, by pkg-config
+# and for the example.
+# Usage: install.sh BUILD_FOLDER SOURCE_FOLDER COMPILER LIBDIR
+set -eu
+build=$1
+source=$2
+compiler=$3
+libdir=$4
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+flags='-std=c++17 -Wall -Wextra -Wpedantic -Werror'
+
+fail() {
+  echo "$*"
+  exit 1
+}
+
+expect() {
+  [ "$2" = "$1" ] || fail "expected: $1
+got: $2"
+}
+
+cmake --install "$build" --prefix "$work/first" >/dev/null
+mv "$work/first" "$work/moved"
+export PKG_CONFIG_PATH="$work/moved/$libdir/pkgconfig" LD_LIBRARY_PATH="$work/moved/$libdir"
+if [ -e "$work/moved/$libdir/libM.so" ]; then
+  (cd "$work/moved" && find . -type f -o -type l) | sed "s:^\./$libdir:lib:; s:^\./::" | sort >"$work/files"
+  [ -e "$work/moved/share" ] || sed '/^share/d' "$source/tests/installed_files.txt" >"$work/expected"
+  [ -e "$work/expected" ] || cp "$source/tests/installed_files.txt" "$work/expected"
+  diff "$work/expected" "$work/files" || fail "< should be installed, > is installed"
+fi
+! grep -rlF -e "$source" -e "$work/first" "$work/moved" || fail "an installed file names a folder of the build"
+
+plain='5/6
+110010 overflow in ratio addition.'
+
+cmake -S "$source/tests/consumer" -B "$work/cmake" -DCMAKE_PREFIX_PATH="$work/moved" \
+  -DCMAKE_CXX_COMPILER="$compiler" -DCMAKE_CXX_FLAGS="$flags" >/dev/null
+cmake --build "$work/cmake" >/dev/null
+expect "$plain" "$(env -u LD_LIBRARY_PATH "$work/cmake/consumer")"
+
+"$compiler" $flags "$source/tests/consumer/consumer.cpp" $(pkg-config --cflags --libs --static M) -o "$work/by_pkg_config"
+expect "$plain" "$("$work/by_pkg_config")"
+
+cmake -S "$source/examples/comp" -B "$work/comp" -DCMAKE_PREFIX_PATH="$work/moved" \
+  -DCMAKE_CXX_COMPILER="$compiler" >/dev/null
+cmake --build "$work/comp" >/dev/null
+expect "$("$build/bin/comp" "$source"/examples/comp/samples/*.json)" \
+  "$("$work/comp/comp" "$source"/examples/comp/samples/*.json)"

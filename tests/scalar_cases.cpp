@@ -1,0 +1,194 @@
+// Fixed point, integer utilities, rounding and ratios, as one call a line.
+
+#include <cctype>
+
+#include "Cases.h"
+#include "Mp_Bits.h"
+#include "Mp_Ratio.h"
+#include "Mp_Utils.h"
+
+namespace {
+
+template <auto kOperation>
+std::string Integers(Arguments& in) {
+  const int32_t a = in.Int();
+  const int32_t result = kOperation(a, in.Int());
+  return Text(result).append(Outcome(0));
+}
+
+template <auto kOperation>
+std::string Arithmetic(Arguments& in) {
+  const M_Ratio a = in.Ratio(), b = in.Ratio();
+  const std::string status = in.Word();
+  return Aliased({a, b}, [&](const M_Ratio* operands, M_Ratio* out) {
+    unsigned char byte = 0;
+    unsigned char* pointer = nullptr;
+    if (status == "ones") pointer = reinterpret_cast<unsigned char*>(UINTPTR_MAX);
+    if (std::isdigit(status[0])) {
+      byte = static_cast<unsigned char>(ToInteger(status));
+      pointer = &byte;
+    }
+    const int32_t code = kOperation(operands, operands + 1, out, pointer);
+    return Text(*out, pointer == &byte ? ToText(byte) : status).append(Outcome(code));
+  });
+}
+
+template <auto kOperation>
+std::string Unary(Arguments& in) {
+  return Aliased({in.Ratio()}, [](const M_Ratio* operands, M_Ratio* out) {
+    M_Ratio unflagged = *operands;
+    unsigned char flag = 9;
+    const int32_t code =
+        kOperation(operands, out, &flag) | kOperation(&unflagged, &unflagged, nullptr);
+    EXPECT_EQ(ToText(unflagged), ToText(*out));
+    return Text(*out, flag).append(Outcome(code));
+  });
+}
+
+template <auto kOperation>
+std::string Clip(Arguments& in) {
+  const M_Ratio value = in.Ratio(), lo = in.Ratio(), hi = in.Ratio();
+  return Aliased({value, lo, hi}, [](const M_Ratio* operands, M_Ratio* out) {
+    const std::string before = ToText(*out);
+    const int32_t code = kOperation(operands, operands + 1, operands + 2, out);
+    return Text(code != 0 && ToText(*out) == before ? "kept" : ToText(*out)).append(Outcome(code));
+  });
+}
+
+// The start in each operand, and the duration in the next one.
+std::string ClipSpan(Arguments& in) {
+  const M_Ratio startA = in.Ratio(), durationA = in.Ratio(), startB = in.Ratio();
+  return Aliased(
+      {startA, durationA, startB, in.Ratio()}, [](const M_Ratio* operands, M_Ratio* out) {
+        M_Ratio* const duration = const_cast<M_Ratio*>(operands) + (out - operands + 1) % 5;
+        const int32_t code =
+            M_ClipSpanToSpan(operands, operands + 1, operands + 2, operands + 3, out, duration);
+        return Text(*out, *duration).append(Outcome(code));
+      });
+}
+
+std::string Compare(Arguments& in) {
+  const M_Ratio a = in.Ratio();
+  return Aliased({a, in.Ratio()}, [](const M_Ratio* operands, M_Ratio* out) {
+    M_Ratio copies[] = {operands[0], operands[1], {77, 77}};
+    M_Ratio* const greatest = copies + (out - operands);
+    int32_t order = 99;
+    const int32_t code = M_CompareRatio(operands, operands + 1, &order);
+    const std::string outcome = Outcome(code);
+    EXPECT_EQ(M_MaxRatio(copies, copies + 1, greatest), code);
+    EXPECT_EQ(Outcome(code), outcome);
+    EXPECT_EQ(M_MinRatio(operands, operands + 1, out), code);
+    EXPECT_EQ(Outcome(code), outcome);
+    return Text(order, *out, *greatest).append(outcome);
+  });
+}
+
+std::string Convert(Arguments& in) {
+  const M_Ratio ratio = in.Ratio();
+  const uint32_t newDen = in.Unsigned();
+  return Aliased({ratio}, [newDen](const M_Ratio* operands, M_Ratio* out) {
+    M_Ratio unflagged = *operands;
+    unsigned char exact = 9, overflow = 9;
+    const int32_t flagged = M_ConvRatio(operands, newDen, out, &exact, &overflow);
+    EXPECT_EQ(flagged, Outcome(flagged) == "" ? 0 : M_ERR_ZERO_DENOMINATOR);
+    const int32_t code = M_ConvRatio(&unflagged, newDen, &unflagged, nullptr, nullptr);
+    EXPECT_EQ(ToText(unflagged), ToText(*out));
+    return Text(*out, exact, overflow).append(Outcome(code));
+  });
+}
+
+std::string ShortConvert(Arguments& in) {
+  const M_Ratio ratio = in.Ratio();
+  const uint32_t newDen = in.Unsigned();
+  int32_t num = 77, unflagged = 78;
+  unsigned char overflow = 9;
+  const int32_t flagged = M_ShortConvRatio(ratio.num, ratio.den, newDen, &num, &overflow);
+  EXPECT_EQ(flagged, Outcome(flagged) == "" ? 0 : M_ERR_ZERO_DENOMINATOR);
+  const int32_t code = M_ShortConvRatio(ratio.num, ratio.den, newDen, &unflagged, nullptr);
+  EXPECT_EQ(num, unflagged);
+  return Text(num, overflow).append(Outcome(code));
+}
+
+std::string FromDouble(Arguments& in) {
+  const double x = in.Double();
+  M_Ratio best = {77, 77}, out = {77, 77};
+  unsigned char isOutOfRange = 9;
+  const int32_t code = Mp_Double2RatioSmart(&best, x) | M_FpLong2Ratio(&out, &isOutOfRange, x);
+  EXPECT_EQ(ToText(out), isOutOfRange ? "0/0" : ToText(best));
+  EXPECT_EQ(M_FpLong2Ratio(&out, nullptr, x), 0);
+  return Text(best).append(isOutOfRange ? " out of range" : "").append(Outcome(code));
+}
+
+std::string Round(Arguments& in) {
+  const double d = in.Double();
+  return Text(M_RoundDouble(d), M_RoundDoubleSafe(d), M_RoundDouble64(d));
+}
+
+std::string LongMultiply(Arguments& in) {
+  const int32_t a = in.Int();
+  int32_t out[2] = {};
+  host.touches = 0;
+  const int32_t code = Mp_LongMul(a, in.Int(), out);
+  EXPECT_EQ(host.touches, 1) << "the host multiplies";
+  return Text(out[0], out[1]).append(Outcome(code));
+}
+
+std::string Bits(Arguments& in) {
+  const uint32_t x = in.Unsigned();
+  return Text(M_LeadingZeros(x), M_TrailingZeros(x), M_RoundDownToPowerOf2(x),
+              M_RoundUpToPowerOf2(x), M_BitsUsed(static_cast<int32_t>(x)), M_IsTopTwoBitsSame(x));
+}
+
+std::string Overflow(Arguments& in) {
+  const int32_t a = in.Int(), b = in.Int();
+  return Text(M_AddWouldOverflow(a, b), M_MulWouldOverflow(a, b),
+              M_UMulWouldOverflow(static_cast<uint32_t>(a), static_cast<uint32_t>(b)));
+}
+
+std::string GcdAndLcm(Arguments& in) {
+  const int32_t a = in.Int(), b = in.Int();
+  const auto ua = static_cast<uint32_t>(a), ub = static_cast<uint32_t>(b);
+  int32_t gcd = 99, lcm = 99;
+  uint32_t ugcd = 99, ulcm = 99;
+  const int32_t code = M_SignedGCD(a, b, &gcd) | M_SignedLCM(a, b, &lcm) |
+                       M_UnsignedGCD(ua, ub, &ugcd) | M_UnsignedLCM(ua, ub, &ulcm);
+  return Text(gcd, lcm, ugcd, ulcm).append(Outcome(code));
+}
+
+const Operation kOperations[] = {
+    {"AddRatio", Arithmetic<M_AddRatio>},
+    {"Bits", Bits},
+    {"ClipRatio", Clip<M_ClipRatio>},
+    {"ClipRatioToSpan", Clip<M_ClipRatioToSpan>},
+    {"ClipSpanToSpan", ClipSpan},
+    {"CompareRatio", Compare},
+    {"ConvRatio", Convert},
+    {"DivRatio", Arithmetic<M_DivRatio>},
+    {"Fix24Mul", Integers<M_Fix24Mul>},
+    {"Fix24Ratio", Integers<M_Fix24Ratio>},
+    {"FixDiv", Integers<M_FixDiv>},
+    {"FixMul", Integers<M_FixMul>},
+    {"FpLong2Ratio", FromDouble},
+    {"GcdAndLcm", GcdAndLcm},
+    {"LongMul", LongMultiply},
+    {"Nibble",
+     [](Arguments& in) {
+       const int nibble = in.Int();
+       return Text(Mp_G_lead_zeros[nibble], Mp_G_trail_zeros[nibble]);
+     }},
+    {"MulRatio", Arithmetic<M_MulRatio>},
+    {"Overflow", Overflow},
+    {"RecipRatio", Unary<M_RecipRatio>},
+    {"ReduceRatio", Unary<M_ReduceRatio>},
+    {"RoundDouble", Round},
+    {"RoundToNearestMult", Integers<M_RoundToNearestMult>},
+    {"ShortConvRatio", ShortConvert},
+    {"SubRatio", Arithmetic<M_SubRatio>},
+    {"fmod",
+     [](Arguments& in) {
+       const double x = in.Double();
+       return Text(static_cast<int64_t>(M_fmod(x, in.Double()) * 1000));
+     }},
+};
+
+}  // namespace
