@@ -1,6 +1,6 @@
 #!/bin/sh
 # Installs what is missing, builds, and runs every test.
-# --all: also with clang++, with the sanitizers, as a static library and unoptimised.
+# --all: also with clang++ and clang-tidy, with the sanitizers, as a static library and unoptimised.
 set -eu
 cd "$(dirname "$0")"
 . scripts/packages.sh
@@ -16,7 +16,7 @@ case ${1-} in
 esac
 
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libbenchmark-dev pkg-config \
-  binutils clang clang-format
+  binutils clang clang-format clang-tidy
 
 echo "Checking the format ..."
 find include src host examples tests bench -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror
@@ -25,4 +25,9 @@ for preset in $presets; do
   build_preset "$preset"
   echo "Testing ($preset) ..."
   ctest --preset "$preset" --progress
+  if [ "$preset" = clang ]; then
+    echo "Reading with clang-tidy ..."
+    find src host examples/comp -name '*.cpp' | xargs -n 1 -P 2 \
+      clang-tidy --quiet --warnings-as-errors='*' -p "build/$preset" 2>/dev/null
+  fi
 done

@@ -72,10 +72,10 @@ struct M_Globals {
   uint32_t birthMagic;         ///< M_LIFE_MAGIC while alive.
   uint32_t services;           ///< Services whose set-up succeeded.
   uint64_t reserved1;          ///< Carried along, never used.
-  U_Handle fcmTable;           ///< 256 x 256 bytes: multiply. Null without the service.
-  U_Handle fcdTable;           ///< 256 x 256 bytes: divide. Null without the service.
+  U_Handle fcmTable;           ///< 256 x 256 bytes: multiply. Null before set-up.
+  U_Handle fcdTable;           ///< 256 x 256 bytes: divide. Null before set-up.
   uint64_t reserved2;          ///< Carried along, never used.
-  U_Handle trigTable;          ///< 256 floats: quarter sine. Null without the service.
+  U_Handle trigTable;          ///< 256 floats: quarter sine. Null before set-up.
   uint32_t birthMagic2;        ///< M_LIFE_MAGIC while alive; alive means both.
   uint16_t fcmdPrepareCount;   ///< Outstanding M_PrepareFCMD. Survives death and birth.
   uint16_t ftrigPrepareCount;  ///< Outstanding M_PrepareFTrig. Survives death and birth.

@@ -1,5 +1,6 @@
 #include "Cases.h"
 
+#include <cstring>
 #include <fstream>
 #include <map>
 
@@ -10,18 +11,18 @@ std::map<std::string, std::string (*)(Arguments&)>& Operations() {
   return operations;
 }
 
-// An expected result with its numbers written as results are.
+// An expected result with its numbers written as results are. Words stay as they are, and so do
+// identifiers and codes, which have no 0x.
 std::string Normal(const std::string& expected) {
   std::istringstream words(expected);
   std::string normal, word;
   while (words >> word) {
-    const std::string digits = word.substr(word[0] == '-');
-    const bool isNumber =
-        digits.find_first_not_of("-0123456789abcdefABCDEFxmin/") == std::string::npos &&
-        (digits.rfind("0x", 0) == 0 || digits.rfind("m", 0) == 0);
-    const size_t slash = word.find('/');
-    const bool isRatio = slash != std::string::npos && word.find_first_of("0123456789") < slash + 2;
-    normal += ' ' + (isRatio ? ToText(ToRatio(word)) : isNumber ? ToText(ToInteger(word)) : word);
+    const std::string number = word.substr(word[0] == '-');
+    const bool isRatio = number.find_first_not_of("-0123456789ABCDEFmaxin/") == std::string::npos &&
+                         number.find('/') != std::string::npos &&
+                         std::strchr("0123456789m", number[0]);
+    const bool isInteger = number == "min" || number == "max" || number.rfind("0x", 0) == 0;
+    normal += ' ' + (isRatio ? ToText(ToRatio(word)) : isInteger ? ToText(ToInteger(word)) : word);
   }
   return normal;
 }

@@ -13,6 +13,7 @@ TestHost host;
 namespace {
 
 char buffer[4096];
+int32_t lastError = 99;
 
 struct Entry {
   const char* key;
@@ -32,11 +33,12 @@ void Note(const char* format, Args... args) {
   ++host.touches;
 }
 
+// Filled, so that a table nobody has filled is noticed.
 U_Handle Allocate(size_t bytes) {
   ++host.allocations;
   if (std::count(host.failing.begin(), host.failing.end(), host.allocations)) return nullptr;
   ++host.handles;
-  return new void*(std::malloc(bytes));
+  return new void*(std::memset(std::malloc(bytes), 0xEE, bytes));
 }
 
 }  // namespace
@@ -60,8 +62,9 @@ void U_FreeHandle(U_Handle handle) {
   --host.handles;
 }
 
-const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t, int32_t) {
+const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t x, int32_t y) {
   ++host.touches;
+  EXPECT_EQ(x | y, 0);
   const auto* const strings = static_cast<const Header*>(header);
   EXPECT_STREQ(strings->component, "M");
   if (index < 0 || static_cast<uint64_t>(index) + 1 >= strings->count) return "(no such text)";
@@ -75,11 +78,12 @@ char* Up_GetThreadLoggingBuffer(void) {
 
 void Up_SetThreadLastError(int32_t error) {
   ++host.touches;
-  EXPECT_EQ(error, 0);
+  lastError = error;
   std::strcpy(buffer, "(not written)");
 }
 
 int32_t Up_ReportError(uint32_t id, int32_t severity) {
+  EXPECT_EQ(std::exchange(lastError, 99), 0) << "cleared before a message is written";
   Note("%x %d %s", id, severity, buffer);
   return 77;
 }

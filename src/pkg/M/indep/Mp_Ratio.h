@@ -16,7 +16,7 @@ int32_t Mp_CalcRatio(const M_Ratio* a, const M_Ratio* b, bool subtract, int16_t 
                      M_Ratio* out, unsigned char* status);
 
 /// *out = the best ratio near x with num and den up to 2^30, always coprime; see M_FpLong2Ratio.
-/// |x| <= 2^-31 gives 0/1; what is too large, a NaN included, gives 2^30/1 with x's sign. Always 0.
+/// |x| <= 2^-31 gives 0/1; what is too large gives 2^30/1 with x's sign, a NaN 2^30/1. Always 0.
 int32_t Mp_Double2RatioSmart(M_Ratio* out, double x);
 }
 #pragma GCC visibility pop
