@@ -29,7 +29,8 @@ bool IsStatusByte(const unsigned char* status) { return status && !IsAllOnes(sta
 
 // Reads the caller's permission to approximate and clears the status byte.
 bool TakePermission(unsigned char* status) {
-  if (!IsStatusByte(status)) return status != nullptr;
+  if (!status) return false;
+  if (IsAllOnes(status)) return true;
   const bool mayApproximate = (*status & kMayApproximate) != 0;
   *status = kExact;
   return mayApproximate;
@@ -39,7 +40,7 @@ bool TakePermission(unsigned char* status) {
 int32_t Finish(unsigned char outcome, int16_t place, int16_t detail, M_Ratio* out,
                unsigned char* status) {
   if (outcome == kOverflow) *out = kInvalid;
-  if (IsStatusByte(status)) {
+  if (status && !IsAllOnes(status)) {
     *status = outcome;
     return 0;
   }
@@ -88,7 +89,8 @@ bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
 }
 
 // a + b, or a - b, over the least common denominator, if no intermediate might leave 32 bits.
-bool TrySum(const M_Ratio& a, const M_Ratio& b, bool subtract, M_Ratio* sum) {
+// Inlined, so that the fast way of an operation calls nothing.
+[[gnu::always_inline]] inline bool TrySum(M_Ratio a, M_Ratio b, bool subtract, M_Ratio* sum) {
   const int32_t bNum = subtract ? Mp::WrapNegate(b.num) : b.num;
   if (a.num == 0) {
     *sum = {bNum, b.den};
@@ -120,7 +122,7 @@ bool TrySum(const M_Ratio& a, const M_Ratio& b, bool subtract, M_Ratio* sum) {
   return true;
 }
 
-bool TryProduct(const M_Ratio& a, const M_Ratio& b, M_Ratio* product) {
+[[gnu::always_inline]] inline bool TryProduct(M_Ratio a, M_Ratio b, M_Ratio* product) {
   if (!AreSmall(a, b) &&
       (Mp::UMulWouldOverflow(a.den, b.den) || Mp::MulWouldOverflow(a.num, b.num))) {
     return false;
@@ -129,47 +131,48 @@ bool TryProduct(const M_Ratio& a, const M_Ratio& b, M_Ratio* product) {
   return true;
 }
 
-// A copy made field by field: operands have often just been written so, and reading both fields at
-// once would wait for the writes to reach memory.
-M_Ratio Load(const M_Ratio* r) { return {r->num, r->den}; }
-
-// The slow ways of Sum and Product are functions of their own, which keeps the fast ways short.
-[[gnu::noinline]] unsigned char SumOfReduced(const M_Ratio& givenA, const M_Ratio& givenB,
-                                             bool subtract, bool mayApproximate, M_Ratio* out) {
-  M_Ratio a = givenA;
-  M_Ratio b = givenB;
+// The slow ways of adding and multiplying: failures, reduction, approximation. out is written once
+// the result is known, so until then the given operands stand even where out is one of them.
+[[gnu::noinline]] int32_t CalcSlowly(const M_Ratio* givenA, const M_Ratio* givenB, bool subtract,
+                                     int16_t detail, M_Ratio* out, unsigned char* status) {
+  const bool mayApproximate = TakePermission(status);
+  M_Ratio a = *givenA;
+  M_Ratio b = *givenB;
+  if (a.den == 0 || b.den == 0) return FailZeroDenominator(Mp_PLACE_CALC_RATIO, detail, out);
+  unsigned char outcome = kExact;
   do {
     const bool hasCancelledA = Cancel(&a);
     const bool hasCancelledB = Cancel(&b);
     if (!hasCancelledA && !hasCancelledB) {
-      if (!mayApproximate) return kOverflow;
-      const double x = ToDouble(givenA);
-      const double y = ToDouble(givenB);
-      return Approximate(subtract ? x - y : x + y, out);
+      outcome = kOverflow;
+      if (mayApproximate) {
+        const double x = ToDouble(*givenA);
+        const double y = ToDouble(*givenB);
+        outcome = Approximate(subtract ? x - y : x + y, out);
+      }
+      break;
     }
   } while (!TrySum(a, b, subtract, out));
-  return kExact;
+  return Finish(outcome, Mp_PLACE_CALC_RATIO, detail, out, status);
 }
 
-unsigned char Sum(const M_Ratio& a, const M_Ratio& b, bool subtract, bool mayApproximate,
-                  M_Ratio* out) {
-  return TrySum(a, b, subtract, out) ? kExact : SumOfReduced(a, b, subtract, mayApproximate, out);
-}
-
-[[gnu::noinline]] unsigned char ProductOfReduced(const M_Ratio& givenA, const M_Ratio& givenB,
-                                                 bool mayApproximate, M_Ratio* out) {
-  M_Ratio a = givenA;
-  M_Ratio b = givenB;
+[[gnu::noinline]] int32_t MulSlowly(const M_Ratio* givenA, const M_Ratio* givenB, M_Ratio* out,
+                                    unsigned char* status) {
+  const bool mayApproximate = TakePermission(status);
+  M_Ratio a = *givenA;
+  M_Ratio b = *givenB;
+  if (a.den == 0 || b.den == 0) {
+    return FailZeroDenominator(Mp_PLACE_MUL_RATIO, Mp_STR_IN_RATIO_MULTIPLY, out);
+  }
+  unsigned char outcome = kExact;
   bool hasCancelled = Cancel(&a);
   hasCancelled |= Cancel(&b);
   hasCancelled |= Cancel(&b.num, &a.den);
   hasCancelled |= Cancel(&a.num, &b.den);
-  if (hasCancelled && TryProduct(a, b, out)) return kExact;
-  return mayApproximate ? Approximate(ToDouble(givenA) * ToDouble(givenB), out) : kOverflow;
-}
-
-unsigned char Product(const M_Ratio& a, const M_Ratio& b, bool mayApproximate, M_Ratio* out) {
-  return TryProduct(a, b, out) ? kExact : ProductOfReduced(a, b, mayApproximate, out);
+  if (!hasCancelled || !TryProduct(a, b, out)) {
+    outcome = mayApproximate ? Approximate(ToDouble(*givenA) * ToDouble(*givenB), out) : kOverflow;
+  }
+  return Finish(outcome, Mp_PLACE_MUL_RATIO, Mp_STR_IN_RATIO_MULTIPLY, out, status);
 }
 
 // The order of a and b as M_CompareRatio has it, sign only. Where the cross products are known to
@@ -206,7 +209,8 @@ int32_t ClipSpan(const M_Ratio& startA, const M_Ratio& durationA, const M_Ratio&
   if (order <= 0) {
     end = startB;
   } else {
-    // Kept on purpose: a span that reaches into b ends where b ends, even if it ended before.
+    // Kept on purpose: a span that reaches into b ends where b ends, even if it ended before. b's
+    // end may have been formed above.
     if (endB.den == 0) {
       const int32_t code = AddToSpan(startB, durationB, Mp_STR_IN_RATIO_SPAN, &endB);
       if (code) return code;
@@ -229,7 +233,7 @@ bool TryConvert(int32_t num, uint32_t den, uint32_t newDen, int32_t* out) {
 extern "C" {
 
 int32_t M_ReduceRatio(const M_Ratio* in, M_Ratio* out, unsigned char* reduced) {
-  M_Ratio r = Load(in);
+  M_Ratio r = *in;
   const uint32_t gcd = Mp::Gcd(Mp::Magnitude(r.num), r.den);
   if (gcd != 1 && gcd < kTwoTo31) r = {r.num / static_cast<int32_t>(gcd), r.den / gcd};
   *out = r;
@@ -239,12 +243,11 @@ int32_t M_ReduceRatio(const M_Ratio* in, M_Ratio* out, unsigned char* reduced) {
 
 int32_t Mp_CalcRatio(const M_Ratio* a, const M_Ratio* b, bool subtract, int16_t detail,
                      M_Ratio* out, unsigned char* status) {
-  const bool mayApproximate = TakePermission(status);
-  const M_Ratio x = Load(a);
-  const M_Ratio y = Load(b);
-  if (x.den == 0 || y.den == 0) return FailZeroDenominator(Mp_PLACE_CALC_RATIO, detail, out);
-  const unsigned char outcome = Sum(x, y, subtract, mayApproximate, out);
-  return Finish(outcome, Mp_PLACE_CALC_RATIO, detail, out, status);
+  if (a->den == 0 || b->den == 0 || !TrySum(*a, *b, subtract, out)) {
+    return CalcSlowly(a, b, subtract, detail, out, status);
+  }
+  if (IsStatusByte(status)) *status = kExact;
+  return 0;
 }
 
 int32_t M_AddRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned char* status) {
@@ -256,14 +259,9 @@ int32_t M_SubRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned ch
 }
 
 int32_t M_MulRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned char* status) {
-  const bool mayApproximate = TakePermission(status);
-  const M_Ratio x = Load(a);
-  const M_Ratio y = Load(b);
-  if (x.den == 0 || y.den == 0) {
-    return FailZeroDenominator(Mp_PLACE_MUL_RATIO, Mp_STR_IN_RATIO_MULTIPLY, out);
-  }
-  const unsigned char outcome = Product(x, y, mayApproximate, out);
-  return Finish(outcome, Mp_PLACE_MUL_RATIO, Mp_STR_IN_RATIO_MULTIPLY, out, status);
+  if (a->den == 0 || b->den == 0 || !TryProduct(*a, *b, out)) return MulSlowly(a, b, out, status);
+  if (IsStatusByte(status)) *status = kExact;
+  return 0;
 }
 
 int32_t M_DivRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned char* status) {
