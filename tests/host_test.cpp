@@ -52,6 +52,7 @@ std::array<size_t, 4> InUse() {
 using Use = std::array<size_t, 4>;
 
 TEST(Handles, AreCountedReclaimedAndFreed) {
+  const Reports reports;
   EXPECT_EQ(InUse(), Use());
   const U_Handle handle = U_AllocateHandle(0x123, "block", 1000);
   const U_Handle quiet = U_AllocateHandleQuiet(24);
@@ -65,10 +66,9 @@ TEST(Handles, AreCountedReclaimedAndFreed) {
   for (const U_Handle each : {handle, quiet, U_Handle()}) U_FreeHandle(each);
   EXPECT_EQ(InUse(), Use());
 
-  const Reports reports;
-  EXPECT_EQ(U_AllocateHandle(0x123, "block", kTooMuch), nullptr);
+  EXPECT_EQ(U_AllocateHandle(0x124, "large", kTooMuch), nullptr);
   EXPECT_EQ(U_AllocateHandleQuiet(kTooMuch), nullptr);
-  EXPECT_EQ(reports.all, (Texts{"123 8 4 block"}));
+  EXPECT_EQ(reports.all, (Texts{"124 8 4 large"}));
   EXPECT_EQ(InUse(), Use());
 }
 
@@ -91,9 +91,9 @@ TEST(Handles, ReclaimedTablesAreRebuilt) {
 
 TEST(TrackedMemory, IsCountedAndAligned) {
   {
-    std::vector<double, U_Allocator<double>> numbers(3);
+    std::vector<double, U_Allocator<double>> numbers(3), others(1);
     EXPECT_EQ(reinterpret_cast<uintptr_t>(numbers.data()) % alignof(std::max_align_t), 0u);
-    EXPECT_EQ(InUse(), (Use{0, 0, 1, 24}));
+    EXPECT_EQ(InUse(), (Use{0, 0, 2, 32}));
     EXPECT_TRUE(numbers.get_allocator() == U_Allocator<int>());
   }
   U_MemTrackedObject::TrackedDelete(nullptr);
@@ -123,30 +123,26 @@ TEST(Reporting, GoesToTheCallbackAndTheLastError) {
 
 TEST(Reporting, MayReportInTurn) {
   Texts received;
-  U_SetReportCallback(
-      [](void* context, const U_Report* report) {
-        auto* const texts = static_cast<Texts*>(context);
-        if (texts->empty()) {
-          texts->emplace_back("outer");
-          Mp_ReportErr(2, 2, 0);
-        }
-        texts->emplace_back(report->text);
-      },
-      &received);
+  const auto receive = [](void* context, const U_Report* report) {
+    if (report->id == 0x110001) Mp_ReportErr(2, 2, 0);
+    static_cast<Texts*>(context)->emplace_back(report->text);
+  };
+  U_SetReportCallback(receive, &received);
   Mp_ReportErr(1, 1, 0);
-  EXPECT_EQ(received, (Texts{"outer", "unknown error (2).", "unknown error (1)."}));
+  U_SetReportCallback(nullptr, nullptr);
+  EXPECT_EQ(received, (Texts{"unknown error (2).", "unknown error (1)."}));
+  std::thread([] { Mp_ReportErr(3, 3, 0); }).join();
   EXPECT_STREQ(Up_GetThreadLoggingBuffer(), "unknown error (1).");
   EXPECT_EQ(Up_GetThreadLastError(), 0x110001);
-  U_SetReportCallback(nullptr, nullptr);
 }
 
 TEST(Reporting, GoesToStandardErrorWithoutACallback) {
   ::testing::internal::CaptureStderr();
-  Up_ReportErrString(0x110018, 8, "text");
-  Up_ReportVarkErrString(0x110014, 8, 12, nullptr);
+  Up_ReportErrString(0x1B, 8, "text");
+  Up_ReportVarkErrString(0x1C, 8, 12, nullptr);
   XLOG_Log(10, "M", "Birth", "M Birth");
   EXPECT_EQ(::testing::internal::GetCapturedStderr(),
-            "[0x110018] text\n[0x110014] host error 12 \nM Birth (10): M Birth\n");
+            "[0x00001B] text\n[0x00001C] host error 12 \nM Birth (10): M Birth\n");
 }
 
 // Each thread sees its own message and last error, whatever the others report.
@@ -154,7 +150,8 @@ TEST(Reporting, IsPerThread) {
   static std::atomic<int> received;
   U_SetReportCallback(
       [](void*, const U_Report* report) {
-        received += report->text == std::string(Up_GetThreadLoggingBuffer());
+        received += report->text == std::string(Up_GetThreadLoggingBuffer()) &&
+                    Up_GetThreadLastError() == static_cast<int32_t>(report->id);
       },
       nullptr);
   std::vector<std::thread> threads;
@@ -201,12 +198,20 @@ class MessagesTest : public ::testing::Test {
 
 TEST_F(MessagesTest, OutsideTheTableAreEmpty) {
   for (const int32_t index : {-1, 42, 43, 100000}) EXPECT_STREQ(Text(index), "");
+  const std::string tooLong = "p=" + std::string(1024, 'x');
+  Mp_StrEntry own[] = {{"p=", {}}, {"p", {}}, {tooLong.c_str(), {}}, {"p=a=b", {}}, {"p=c", {}}};
+  const Mp_StrHeader header = {"M", 4, own, 0};
+  SetLanguage("de");
+  for (const int32_t i : {0, 1, 2, 4}) EXPECT_STREQ(U_ZLookupLStrCache(&header, i, 0, 0), "") << i;
+  EXPECT_STREQ(U_ZLookupLStrCache(&header, 3, 0, 0), "a=b");
+  SetLanguage("");
   EXPECT_STREQ(Text(41), "attempt to normalize a homegeneous point");
 }
 
 // The catalogues in the folder of the environment were made for this: each line of the rows beside
 // them is a language and what is to come of its translation.
 TEST_F(MessagesTest, OfBadCataloguesAreNotUsed) {
+  const Reports reports;
   const char* const folder = std::getenv("CATALOGUES");
   ASSERT_NE(folder, nullptr);
   U_SetMessageFolder(folder);
@@ -216,8 +221,14 @@ TEST_F(MessagesTest, OfBadCataloguesAreNotUsed) {
        ++count) {
     SetLanguage(language.c_str());
     EXPECT_EQ(Text(Mp_STR_OVERFLOW), expected);
+    Mp_ReportErr(1, M_ERR_OVERFLOW, Mp_STR_OVERFLOW);
+    EXPECT_EQ(reports.all.back(),
+              "110001 8 0 " + std::string(expected).replace(expected.find("%s"), 2, expected));
   }
   EXPECT_GT(count, 10);
+  U_SetMessageFolder(nullptr);
+  SetLanguage("de");
+  EXPECT_STRNE(Text(Mp_STR_OVERFLOW), "overflow %s.");
 }
 
 }  // namespace

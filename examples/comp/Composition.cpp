@@ -87,9 +87,9 @@ class Fields {
     if (!value || !std::isfinite(*value)) ComplainAbout(field, "\"" + text + "\" is not a number");
     if (*value <= 0) ComplainAbout(field, text + " is not greater than zero");
     M_Ratio ratio;
-    unsigned char isOutOfRange;
-    M_FpLong2Ratio(&ratio, &isOutOfRange, *value);
-    if (isOutOfRange || ratio.num == 0) ComplainAbout(field, text + " is out of range");
+    M_FpLong2Ratio(&ratio, nullptr, *value);
+    // 0/0 for what is too large, 0/1 for what is too small.
+    if (ratio.num == 0) ComplainAbout(field, text + " is out of range");
     if (isFrameRate) {
       // 23.976, 29.97 and their like stand for thousands over 1001, which differ by a millionth.
       const int32_t nominal = M_RoundDouble(*value * 1.001);
@@ -107,7 +107,7 @@ class Fields {
 
 Layer ReadLayer(const Json& json, const std::string& fileName, size_t number) {
   std::string place = fileName + ": layer " + std::to_string(number);
-  if (json.is_object() && json.contains("name") && json["name"].is_string()) {
+  if (json.contains("name") && json["name"].is_string()) {
     place += " (\"" + json["name"].get<std::string>() + "\")";
   }
   const Fields fields(json, place, {"name", "sourceRate", "timeBase", "in", "out", "stretch"});

@@ -63,11 +63,11 @@ class SheetMaker {
   Time InFrames(const Value& seconds) const {
     const Value frames = Calculate(M_MulRatio, seconds, frameRate_);
     if (frames.accuracy == Accuracy::kOverflow) return {seconds, {0, false, true}};
+    // A whole number rounded from a ratio has no more bits than its numerator.
     M_Ratio whole;
-    unsigned char isExact, hasOverflowed;
-    M_ConvRatio(&frames.ratio, 1, &whole, &isExact, &hasOverflowed);
-    const bool isApproximated = frames.accuracy == Accuracy::kApproximated;
-    return {seconds, {whole.num, isExact && !isApproximated, hasOverflowed != 0}};
+    unsigned char isExact;
+    M_ConvRatio(&frames.ratio, 1, &whole, &isExact, nullptr);
+    return {seconds, {whole.num, isExact && frames.accuracy == Accuracy::kExact, false}};
   }
 
   // Both ends are held to the composition by themselves: M_ClipSpanToSpan would end every layer

@@ -1,7 +1,7 @@
 // comp: prints the time sheet of a composition file.
 
 #include <clocale>
-#include <cstdio>
+#include <cstdlib>
 #include <fstream>
 #include <iostream>
 #include <string>
@@ -65,7 +65,6 @@ std::string MakeSheets(const std::vector<std::string>& fileNames, bool asJson) {
 
 int main(int argc, char** argv) {
   std::setlocale(LC_ALL, "");
-  std::setlocale(LC_NUMERIC, "C");
   bool asJson = false;
   std::vector<std::string> fileNames;
   for (int i = 1; i < argc; ++i) {
@@ -90,7 +89,7 @@ int main(int argc, char** argv) {
 
   // Birth and death are logged; a command line tool has no use for that.
   U_SetLogCallback([](void*, int32_t, const char*, const char*, const char*) {}, nullptr);
-  if (const int32_t code = M_Birth(0, nullptr)) return code;
+  if (M_Birth(0, nullptr) != 0) return EXIT_FAILURE;
   int status = 0;
   try {
     std::cout << MakeSheets(fileNames, asJson) << std::flush;
