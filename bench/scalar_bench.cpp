@@ -95,8 +95,8 @@ bool IsSame(M_Ratio r, AVRational q) { return av_cmp_q(ToAv(r), q) == 0; }
 // One operation on pairs of ratios: ours as it stands, ours reduced to lowest terms as the peers
 // always do, and the peers.
 template <class Ours, class Theirs, class TheirsAv>
-void RatioLines(const std::string& name, const Pairs<M_Ratio>& pairs, Ours ours, Theirs boost,
-                TheirsAv avutil) {
+void RatioLines(const std::string& name, const Pairs<M_Ratio>& pairs, Ours ours,
+                [[maybe_unused]] Theirs boost, [[maybe_unused]] TheirsAv avutil) {
   const auto reduced = [ours](const auto& pair) { return Reduced(ours(pair)); };
   Line(name, "M", pairs, ours);
   Line(name + ", reduced", "M", pairs, reduced);
