@@ -12,11 +12,15 @@
 
 namespace bench {
 
+/// Gives a line its place in the table, that of its first mention.
+void NoteLine(const std::string& what);
+
 /// Measures work(operand) over all operands, in ns an operand, as line `what` of `subject`. The
 /// subject "M" is ours; every other one is a peer.
 template <class Operand, class Work>
 void Line(const std::string& what, const std::string& subject, const std::vector<Operand>& operands,
           Work work) {
+  NoteLine(what);
   const auto run = [work, &operands](benchmark::State& state) {
     size_t next = 0;
     for (auto unused : state) {

@@ -175,12 +175,17 @@ bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
   return Finish(outcome, Mp_PLACE_MUL_RATIO, Mp_STR_IN_RATIO_MULTIPLY, out, status);
 }
 
+// Not inlined, to keep the fast way of Order short.
+[[gnu::noinline]] int32_t OrderSlowly(const M_Ratio& a, const M_Ratio& b, int32_t* order) {
+  return M_CompareRatio(&a, &b, order);
+}
+
 // The order of a and b as M_CompareRatio has it, sign only. Where the cross products are known to
 // tell the same, no common denominator is looked for.
 int32_t Order(const M_Ratio& a, const M_Ratio& b, int32_t* order) {
   const auto isPlainDen = [](uint32_t den) { return den - 1 < kTwoTo31 - 1; };
   if (!isPlainDen(a.den) || !isPlainDen(b.den) || b.num == INT32_MIN) {
-    return M_CompareRatio(&a, &b, order);
+    return OrderSlowly(a, b, order);
   }
   *order = Compare(int64_t{a.num} * b.den, int64_t{b.num} * a.den);
   return 0;
@@ -338,14 +343,14 @@ int32_t M_CompareRatio(const M_Ratio* a, const M_Ratio* b, int32_t* order) {
 int32_t M_MinRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out) {
   int32_t order;
   if (const int32_t code = Order(*a, *b, &order)) return Fail(code, out);
-  *out = order <= 0 ? *a : *b;
+  *out = *(order <= 0 ? a : b);
   return 0;
 }
 
 int32_t M_MaxRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out) {
   int32_t order;
   if (const int32_t code = Order(*a, *b, &order)) return Fail(code, out);
-  *out = order < 0 ? *b : *a;
+  *out = *(order < 0 ? b : a);
   return 0;
 }
 
