@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "Mp_Strs.h"
 #include "U.h"
 #include "XLOG.h"
 
@@ -14,16 +15,6 @@ namespace {
 
 char buffer[4096];
 int32_t lastError = 99;
-
-struct Entry {
-  const char* key;
-  uint64_t cache[3];
-};
-struct Header {
-  const char* component;
-  uint64_t count;
-  const Entry* table;
-};
 
 template <class... Args>
 void Note(const char* format, Args... args) {
@@ -65,7 +56,7 @@ void U_FreeHandle(U_Handle handle) {
 const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t x, int32_t y) {
   ++host.touches;
   EXPECT_EQ(x | y, 0);
-  const auto* const strings = static_cast<const Header*>(header);
+  const auto* const strings = static_cast<const Mp_StrHeader*>(header);
   EXPECT_STREQ(strings->component, "M");
   if (index < 0 || static_cast<uint64_t>(index) + 1 >= strings->count) return "(no such text)";
   return std::strchr(strings->table[index].key, '=') + 1;

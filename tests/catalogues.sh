@@ -32,4 +32,4 @@ xk|%% %s|overflow %s.
 xl|$long%s
 xm|0$long%s|overflow %s.
 ROWS
-CATALOGUES=$work "$program" --gtest_filter=MessagesTest.OfBadCataloguesAreNotUsed
+CATALOGUES=$work "$program" --gtest_filter=Messages.OfBadCataloguesAreNotUsed

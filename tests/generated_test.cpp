@@ -34,10 +34,7 @@ class Generator {
                        : random;
   }
   int32_t Signed() { return static_cast<int32_t>(Below(2) ? Spread() : 0 - Spread()); }
-  M_Ratio Ratio() {
-    const int32_t num = Signed();
-    return {num, std::max(Spread(), 1u)};
-  }
+  M_Ratio Ratio() { return {Signed(), std::max(Spread(), 1u)}; }
 
  private:
   uint64_t state_;
@@ -46,16 +43,6 @@ class Generator {
 int Bits(Wide v) { return static_cast<int>(std::bit_width(static_cast<uint64_t>(v < 0 ? -v : v))); }
 int Sign(Wide v) { return (v > 0) - (v < 0); }
 bool IsInt32(Wide v) { return v == static_cast<int32_t>(v); }
-
-TEST(Generated, GreatestCommonDivisors) {
-  Generator generator(1);
-  for (int i = 0; i < 300000; ++i) {
-    const uint32_t a = generator.Spread(), b = generator.Spread();
-    uint32_t gcd = 99;
-    M_UnsignedGCD(a, b, &gcd);
-    ASSERT_EQ(gcd, b == 0 ? 1 : std::gcd(a, b)) << a << ' ' << b;
-  }
-}
 
 // The sum over the least common denominator, unless a bit length forbids it.
 bool PlainSum(const M_Ratio& a, const M_Ratio& b, M_Ratio* sum) {
@@ -80,8 +67,7 @@ TEST(Generated, Ratios) {
   Generator generator(3);
   for (int i = 0; i < 300000; ++i) {
     M_Ratio a = generator.Ratio(), b = generator.Ratio(), out = {}, expected = {};
-    if (i % 3 == 0)
-      b = {i % 2 ? b.num : a.num / 2 * 2 + static_cast<int>(generator.Below(2)), a.den};
+    if (i % 3 == 0) b = {i % 2 ? b.num : a.num ^ 1, a.den};
     if (i % 3 == 1) {
       const uint32_t common = generator.Below(0x10000) + 1;
       a.den = (a.den % 0x1000 + 1) * common, b.den = (b.den % 0x1000 + 1) * common;

@@ -20,118 +20,133 @@ std::string State(const M_Globals& globals) {
               globals.ftrigPrepareCount, globals.fcmdPrepareCount, host.handles);
 }
 
+U_Handle M_Globals::*Table(const std::string& name) {
+  if (name == "trig") return &M_Globals::trigTable;
+  return name == "fcm" ? &M_Globals::fcmTable : &M_Globals::fcdTable;
+}
+
 // Two lent pointers against the tables they should be.
 template <class T>
 std::string Lent(const T* lent, U_Handle handle) {
-  if (!lent) return "null";
-  return handle && lent == *handle ? "lent" : "stray";
+  return !lent ? "null" : handle && lent == *handle ? "lent" : "stray";
 }
 
-const Operation kOperations[] = {
-    {"Fresh",
-     [](Arguments&) {
-       Mp_SetdownTrig(), Mp_SetdownFCM();
-       const int left = host.handles;
-       Mp_G = handedOver = {};
-       host = {};
-       return Text(left);
-     }},
-    {"Fail",
-     [](Arguments& in) {
-       host.failing.clear();
-       for (int count = in.Int(); count > 0; --count)
-         host.failing.push_back(host.allocations + in.Int());
-       return std::string();
-     }},
-    {"HostAnswers", [](Arguments& in) { return host.reportResult = in.Int(), std::string(); }},
-    {"Reclaim",
-     [](Arguments& in) {
-       const std::string name = in.Word();
-       const U_Handle handle = name == "trig"  ? Mp_G.trigTable
-                               : name == "fcm" ? Mp_G.fcmTable
-                                               : Mp_G.fcdTable;
-       std::free(*handle);
-       *handle = nullptr;
-       return std::string();
-     }},
-    {"Set",
-     [](Arguments& in) {
-       const std::string name = in.Word();
-       const uint32_t value = in.Unsigned();
-       if (name == "birthMagic") Mp_G.birthMagic = value;
-       if (name == "birthMagic2") Mp_G.birthMagic2 = value;
-       if (name == "services") Mp_G.services = value;
-       if (name == "counts")
-         Mp_G.ftrigPrepareCount = Mp_G.fcmdPrepareCount = static_cast<uint16_t>(value);
-       if (name == "reserved") Mp_G.reserved1 = value, Mp_G.reserved2 = value + 1;
-       if (name == "fcm") std::swap(Mp_G.fcmTable, handedOver.fcmTable);
-       if (name == "fcd") std::swap(Mp_G.fcdTable, handedOver.fcdTable);
-       if (name == "trig") std::swap(Mp_G.trigTable, handedOver.trigTable);
-       return std::string();
-     }},
-    {"State", [](Arguments&) { return State(Mp_G); }},
-    {"HandedOver",
-     [](Arguments&) {
-       return State(handedOver)
-           .append(Text(static_cast<int64_t>(handedOver.reserved1),
-                        static_cast<int64_t>(handedOver.reserved2)));
-     }},
-    {"Birth",
-     [](Arguments& in) {
-       uint32_t granted = 99;
-       const int32_t code = M_Birth(in.Unsigned(), &granted);
-       return Text(granted).append(Outcome(code));
-     }},
-    {"BirthWithoutOutput", [](Arguments& in) { return Outcome(M_Birth(in.Unsigned(), nullptr)); }},
-    {"Death", [](Arguments&) { return Outcome(M_Death()); }},
-    {"GetGlobals", [](Arguments&) { return Outcome(M_GetGlobals(&handedOver)); }},
-    {"SetGlobals", [](Arguments&) { return Outcome(M_SetGlobals(&handedOver)); }},
-    {"Timer",
-     [](Arguments&) {
-       return Outcome(Mp_SetupTimer() | Mp_SetdownTimer() | Mp_PauseTimer() | Mp_ContinueTimer());
-     }},
-    {"PrepareFTrig",
-     [](Arguments& in) {
-       const bool report = in.Int(), noRebuild = in.Int();
-       const float stray = 0, *table = &stray;
-       unsigned char ready = 9;
-       const int32_t code = M_PrepareFTrig(report, noRebuild, &ready, &table);
-       return Text(ready, Lent(table, Mp_G.trigTable)).append(Outcome(code));
-     }},
-    {"PrepareFCMD",
-     [](Arguments& in) {
-       const bool report = in.Int(), noRebuild = in.Int();
-       const unsigned char stray = 0, *mul = &stray, *div = &stray;
-       unsigned char ready = 9;
-       const int32_t code = M_PrepareFCMD(report, noRebuild, &ready, &mul, &div);
-       return Text(ready, Lent(mul, Mp_G.fcmTable), Lent(div, Mp_G.fcdTable)).append(Outcome(code));
-     }},
-    {"PrepareWithoutOutputs",
-     [](Arguments&) {
-       return Outcome(M_PrepareFTrig(false, false, nullptr, nullptr) |
-                      M_PrepareFCMD(false, false, nullptr, nullptr, nullptr));
-     }},
-    {"UnprepareFTrig", [](Arguments&) { return Outcome(M_UnprepareFTrig()); }},
-    {"UnprepareFCMD", [](Arguments&) { return Outcome(M_UnprepareFCMD()); }},
-    {"TrigEntry",
-     [](Arguments& in) {
-       return Text(static_cast<int>(static_cast<float*>(*Mp_G.trigTable)[in.Int()] * 0x1p24f));
-     }},
-    {"CharEntries",
-     [](Arguments& in) {
-       const int a = in.Int(), b = in.Int();
-       return Text(static_cast<unsigned char*>(*Mp_G.fcmTable)[a * 256 + b],
-                   static_cast<unsigned char*>(*Mp_G.fcdTable)[a * 256 + b]);
-     }},
-    {"ReportErr",
-     [](Arguments& in) {
-       const auto place = static_cast<int16_t>(in.Int());
-       const int32_t code = in.Int();
-       host.touches = 0;
-       EXPECT_EQ(Mp_ReportErr(place, code, static_cast<int16_t>(in.Int())), code);
-       return Text(host.touches).append(Outcome(0));
-     }},
-};
+const Operation kFresh("Fresh", [](Arguments&) {
+  Mp_SetdownTrig(), Mp_SetdownFCM();
+  const int left = host.handles;
+  Mp_G = handedOver = {};
+  host = {};
+  return Text(left);
+});
+
+const Operation kFail("Fail", [](Arguments& in) {
+  host.failing.clear();
+  for (int i = in.Int(); i > 0; --i) host.failing.push_back(host.allocations + in.Int());
+  return std::string();
+});
+
+const Operation kHostAnswers("HostAnswers", [](Arguments& in) {
+  return host.reportResult = in.Int(), std::string();
+});
+
+// Takes a table's memory away, as a host may.
+const Operation kReclaim("Reclaim", [](Arguments& in) {
+  void*& data = *(Mp_G.*Table(in.Word()));
+  std::free(std::exchange(data, nullptr));
+  return std::string();
+});
+
+// Puts a table aside, or brings it back.
+const Operation kSwap("Swap", [](Arguments& in) {
+  const auto table = Table(in.Word());
+  return std::swap(Mp_G.*table, handedOver.*table), std::string();
+});
+
+const Operation kSet("Set", [](Arguments& in) {
+  const std::string name = in.Word();
+  const uint32_t value = in.Unsigned();
+  if (name == "birthMagic") Mp_G.birthMagic = value;
+  if (name == "birthMagic2") Mp_G.birthMagic2 = value;
+  if (name == "services") Mp_G.services = value;
+  if (name == "counts") Mp_G.ftrigPrepareCount = Mp_G.fcmdPrepareCount = value & 0xFFFF;
+  if (name == "reserved") Mp_G.reserved1 = value, Mp_G.reserved2 = value + 1;
+  return std::string();
+});
+
+const Operation kState("State", [](Arguments&) { return State(Mp_G); });
+
+const Operation kHandedOver("HandedOver", [](Arguments&) {
+  return State(handedOver)
+      .append(Text(static_cast<int64_t>(handedOver.reserved1),
+                   static_cast<int64_t>(handedOver.reserved2)));
+});
+
+const Operation kBirth("Birth", [](Arguments& in) {
+  uint32_t granted = 99;
+  const int32_t code = M_Birth(in.Unsigned(), &granted);
+  return Text(granted).append(Outcome(code));
+});
+
+const Operation kBirthWithoutOutput("BirthWithoutOutput", [](Arguments& in) {
+  return Outcome(M_Birth(in.Unsigned(), nullptr));
+});
+
+const Operation kDeath("Death", [](Arguments&) { return Outcome(M_Death()); });
+
+const Operation kGetGlobals("GetGlobals",
+                            [](Arguments&) { return Outcome(M_GetGlobals(&handedOver)); });
+
+const Operation kSetGlobals("SetGlobals",
+                            [](Arguments&) { return Outcome(M_SetGlobals(&handedOver)); });
+
+const Operation kTimer("Timer", [](Arguments&) {
+  return Outcome(Mp_SetupTimer() | Mp_SetdownTimer() | Mp_PauseTimer() | Mp_ContinueTimer());
+});
+
+const Operation kPrepareFTrig("PrepareFTrig", [](Arguments& in) {
+  const bool report = in.Int(), noRebuild = in.Int();
+  const float stray = 0, *table = &stray;
+  unsigned char ready = 9;
+  const int32_t code = M_PrepareFTrig(report, noRebuild, &ready, &table);
+  return Text(ready, Lent(table, Mp_G.trigTable)).append(Outcome(code));
+});
+
+const Operation kPrepareFCMD("PrepareFCMD", [](Arguments& in) {
+  const bool report = in.Int(), noRebuild = in.Int();
+  const unsigned char stray = 0, *mul = &stray, *div = &stray;
+  unsigned char ready = 9;
+  const int32_t code = M_PrepareFCMD(report, noRebuild, &ready, &mul, &div);
+  return Text(ready, Lent(mul, Mp_G.fcmTable), Lent(div, Mp_G.fcdTable)).append(Outcome(code));
+});
+
+const Operation kPrepareWithoutOutputs("PrepareWithoutOutputs", [](Arguments&) {
+  return Outcome(M_PrepareFTrig(false, false, nullptr, nullptr) |
+                 M_PrepareFCMD(false, false, nullptr, nullptr, nullptr));
+});
+
+const Operation kUnprepareFTrig("UnprepareFTrig",
+                                [](Arguments&) { return Outcome(M_UnprepareFTrig()); });
+
+const Operation kUnprepareFCMD("UnprepareFCMD",
+                               [](Arguments&) { return Outcome(M_UnprepareFCMD()); });
+
+const Operation kTrigEntry("TrigEntry", [](Arguments& in) {
+  return Text(static_cast<int>(static_cast<float*>(*Mp_G.trigTable)[in.Int()] * 0x1p24f));
+});
+
+const Operation kCharEntries("CharEntries", [](Arguments& in) {
+  const int a = in.Int(), b = in.Int();
+  return Text(static_cast<unsigned char*>(*Mp_G.fcmTable)[a * 256 + b],
+              static_cast<unsigned char*>(*Mp_G.fcdTable)[a * 256 + b]);
+});
+
+const Operation kReportErr("ReportErr", [](Arguments& in) {
+  const auto place = static_cast<int16_t>(in.Int());
+  const int32_t code = in.Int();
+  host.touches = 0;
+  EXPECT_EQ(Mp_ReportErr(place, code, static_cast<int16_t>(in.Int())), code);
+  return Text(host.touches).append(Outcome(0));
+});
 
 TEST(MessageTable, Layout) {
   EXPECT_STREQ(M_G_zhdr.component, "M");
