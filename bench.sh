@@ -4,7 +4,7 @@
 # Arguments go to the benchmark program, such as --benchmark_filter=add.
 set -eu
 cd "$(dirname "$0")"
-. scripts/packages.sh
+. scripts/common.sh
 
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libbenchmark-dev pkg-config \
   libboost-dev libavutil-dev

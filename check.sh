@@ -3,7 +3,7 @@
 # --all: also with clang++ and clang-tidy, with the sanitizers, as a static library and unoptimised.
 set -eu
 cd "$(dirname "$0")"
-. scripts/packages.sh
+. scripts/common.sh
 
 presets=release
 case ${1-} in

@@ -2,7 +2,7 @@
 # Installs what is missing, builds, and prints the time sheets of the sample compositions.
 set -eu
 cd "$(dirname "$0")"
-. scripts/packages.sh
+. scripts/common.sh
 
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libbenchmark-dev pkg-config
 build_preset release --target comp catalogues

@@ -255,8 +255,8 @@ static_assert(offsetof(M_Ratio, num) == 0 && offsetof(M_Ratio, den) == 4);
 
 extern "C" {
 
-/// in in lowest terms; out may be in. `reduced` receives whether the gcd was not 1. A gcd of 2^31
-/// or more is left in place (but `reduced` is 1). 0/n gives 0/1. Always 0.
+/// *out = in, in lowest terms; out may be in. `reduced` receives whether the gcd was not 1. A gcd
+/// of 2^31 or more is left in place (but `reduced` is 1). 0/n gives 0/1. Always 0.
 int32_t M_ReduceRatio(const M_Ratio* in, M_Ratio* out, unsigned char* reduced);
 
 // The `status` of add, subtract, multiply and divide:
@@ -273,7 +273,7 @@ int32_t M_ReduceRatio(const M_Ratio* in, M_Ratio* out, unsigned char* reduced);
 /// *out = a + b, over the least common denominator (not reduced), exact where it fits.
 int32_t M_AddRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned char* status);
 
-/// *out = a - b, as M_AddRatio.
+/// *out = a - b, as M_AddRatio. A b.num of -2^31 is its own negative.
 int32_t M_SubRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned char* status);
 
 /// *out = a x b, reduced only where it would not fit otherwise.
@@ -289,8 +289,8 @@ int32_t M_DivRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned ch
 /// cancels, in which case both fields were halved. A zero ratio gives 0/0. Always 0, no report.
 int32_t M_RecipRatio(const M_Ratio* in, M_Ratio* out, unsigned char* exact);
 
-/// *order < 0, = 0 or > 0 for a < b, a = b, a > b; only the sign counts. A zero denominator gives
-/// order 0 and is reported.
+/// *order < 0, = 0 or > 0 for a < b, a = b, a > b; only the sign counts. A b.num of -2^31 is its
+/// own negative. A zero denominator gives order 0 and is reported.
 int32_t M_CompareRatio(const M_Ratio* a, const M_Ratio* b, int32_t* order);
 
 /// *out = the smaller; a when they are equal. A zero denominator is reported and gives 0/0.

@@ -32,4 +32,5 @@ xk|%% %s|overflow %s.
 xl|$long%s
 xm|0$long%s|overflow %s.
 ROWS
-CATALOGUES=$work "$program" --gtest_filter=Messages.OfBadCataloguesAreNotUsed
+CATALOGUES=$work "$program" --gtest_filter=Messages.OfBadCataloguesAreNotUsed | tee "$work/out"
+grep -q '^\[  PASSED  \] 1 test' "$work/out"

@@ -24,6 +24,10 @@ sheets --json | tr -d '\n' | sed 's/  */ /g; s/{ "name"/\
 diff "$tests/comp_json.txt" "$work/json" || fail "< the JSON as it should be, > as it is"
 "$program" --help >"$work/help" && grep -q '^Usage: comp' "$work/help" || fail "--help does not help"
 
+status=0
+"$program" "$samples/film.json" >/dev/full 2>"$work/err" || status=$?
+[ "$status" = 1 ] && grep -q 'cannot be written' "$work/err" || fail "exit status $status where nothing can be written"
+
 # EDIT of the base file, what its sheet then says.
 says() {
   sed "$1" "$tests/comp_base.json" >"$work/edited.json"
@@ -50,14 +54,16 @@ refuse "no file is given; see comp --help."
 refuse "-f is not an option; see comp --help." -f "$samples/film.json"
 while IFS='|' read -r edit sentence; do
   sed "$edit" "$tests/comp_base.json" >"$work/bad.json"
-  case $sentence in is*) ;; *) sentence=" $sentence" ;; esac
-  refuse "$work/bad.json: ${sentence# }" "$samples/film.json" "$work/bad.json"
+  refuse "$work/bad.json: $sentence" "$samples/film.json" "$work/bad.json"
 done <"$tests/comp_errors.txt"
 length=$(wc -c <"$tests/comp_base.json")
 while [ "$length" -gt 5 ]; do
   length=$((length - 5))
   head -c "$length" "$tests/comp_base.json" >"$work/cut.json"
-  refuse "$work/cut.json: is not JSON, or ends too soon (at byte $((length + 1)))." "$work/cut.json"
+  status=0
+  "$program" "$work/cut.json" >"$work/out" 2>"$work/err" || status=$?
+  [ "$status" = 2 ] && [ ! -s "$work/out" ] && grep -q "ends too soon (at byte $((length + 1)))\.$" "$work/err" ||
+    fail "exit status $status, cut at $length"
 done
 
 # Needs the catalogues, which are there where msgfmt was.

@@ -132,12 +132,30 @@ Layer ReadLayer(const Json& json, const std::string& fileName, size_t number) {
 }  // namespace
 
 Composition ReadComposition(std::istream& in, const std::string& fileName) {
+  // Follows the parser, so that it can be said where the file stopped making sense.
+  size_t layerNumber = 0;
+  std::string field;
+  const auto follow = [&](int depth, Json::parse_event_t event, Json& parsed) {
+    if (event == Json::parse_event_t::object_start && depth == 2) {
+      ++layerNumber;
+      field.clear();
+    }
+    if (event == Json::parse_event_t::key) field = parsed;
+    return true;
+  };
+  const auto complain = [&](const std::string& what) {
+    std::string place =
+        layerNumber == 0 ? ": composition" : ": layer " + std::to_string(layerNumber);
+    if (!field.empty()) place += ", at or behind field \"" + field + "\"";
+    throw InputError(fileName + place + ": " + what + ".");
+  };
   Json json;
   try {
-    json = Json::parse(in);
+    json = Json::parse(in, follow);
   } catch (const Json::parse_error& error) {
-    throw InputError(fileName + ": is not JSON, or ends too soon (at byte " +
-                     std::to_string(error.byte) + ").");
+    complain("is not JSON, or ends too soon (at byte " + std::to_string(error.byte) + ")");
+  } catch (const Json::out_of_range&) {
+    complain("a number is too large");
   }
   const Fields fields(json, fileName + ": composition",
                       {"name", "frameRate", "start", "duration", "layers"});

@@ -86,14 +86,15 @@ class SheetMaker {
     row.name = layer.name;
     row.timeBase = layer.timeBase;
     row.hasSourceRate = layer.hasSourceRate;
-    row.unit = {layer.timeBase.ratio, Accuracy::kExact};
-    if (layer.hasSourceRate) M_RecipRatio(&row.unit.ratio, &row.unit.ratio, nullptr);
+    // Seconds a unit of the layer's time base.
+    Value unit = {layer.timeBase.ratio, Accuracy::kExact};
+    if (layer.hasSourceRate) M_RecipRatio(&unit.ratio, &unit.ratio, nullptr);
     row.stretch = layer.stretch;
     row.inUnits = layer.in;
     row.outUnits = layer.out;
-    row.in = InFrames(Calculate(M_MulRatio, Units(layer.in), row.unit));
-    row.out = InFrames(Calculate(M_MulRatio, Units(layer.out), row.unit));
-    row.duration = InFrames(Calculate(M_MulRatio, Units(layer.out - layer.in), row.unit));
+    row.in = InFrames(Calculate(M_MulRatio, Units(layer.in), unit));
+    row.out = InFrames(Calculate(M_MulRatio, Units(layer.out), unit));
+    row.duration = InFrames(Calculate(M_MulRatio, Units(layer.out - layer.in), unit));
     row.clippedIn = InFrames(Clip(row.in.seconds));
     row.clippedOut = InFrames(Clip(row.out.seconds));
     row.clippedDuration =

@@ -39,7 +39,6 @@ struct Time {
 
 struct Row {
   std::string name;
-  Value unit;  ///< Seconds a unit of the layer's time base.
   GivenRatio timeBase;
   bool hasSourceRate;
   GivenRatio stretch;

@@ -39,8 +39,8 @@ A composition file is a JSON object:
     in, out     first unit, and the unit behind the last
     stretch     seconds on screen a second of the source; 1 if left out
 
-Exit status: 0 if every sheet was printed, 2 if an argument or a file cannot be
-used. The library's own reports are part of the sheet, in the language of the
+Exit status: 0 if every sheet was printed, 1 if the output cannot be written, 2
+if an argument or a file cannot be used. The library's own reports are part of the sheet, in the language of the
 environment.
 )";
 
@@ -92,7 +92,10 @@ int main(int argc, char** argv) {
   if (M_Birth(0, nullptr) != 0) return EXIT_FAILURE;
   int status = 0;
   try {
-    std::cout << MakeSheets(fileNames, asJson) << std::flush;
+    if (!(std::cout << MakeSheets(fileNames, asJson) << std::flush)) {
+      std::cerr << "comp: the output cannot be written.\n";
+      status = EXIT_FAILURE;
+    }
   } catch (const comp::InputError& error) {
     std::cerr << "comp: " << error.what() << '\n';
     status = kBadInput;

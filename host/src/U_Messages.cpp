@@ -70,8 +70,8 @@ void BindCatalogue(const char* component) {
   if (!bound || folder != bound) bindtextdomain(component, folder.c_str());
 }
 
-// The next placeholder of a format: from a '%' up to its conversion letter. Moves
-// `text` behind it; empty at the end.
+// The next placeholder of a format: from a '%' up to its conversion letter. Moves `text` behind it;
+// empty at the end.
 std::string_view NextPlaceholder(const char** text) {
   const char* const start = std::strchr(*text, '%');
   if (!start) return {};

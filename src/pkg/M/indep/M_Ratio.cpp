@@ -20,7 +20,7 @@ constexpr unsigned char kExact = 0;           // out
 constexpr unsigned char kOverflow = 1;        // out
 constexpr unsigned char kApproximated = 2;    // out
 
-// The status pointer with all bits set: approximate unasked.
+// The status pointer with all bits set: approximate and halve unasked.
 bool IsAllOnes(const unsigned char* status) {
   return reinterpret_cast<uintptr_t>(status) == UINTPTR_MAX;
 }

@@ -1,5 +1,6 @@
-# Sourced by the commands of this project: installs Debian packages that are missing.
+# Sourced by the commands of this project.
 
+# Installs those of the named Debian packages that are missing.
 need_packages() {
   missing=
   for package in "$@"; do
