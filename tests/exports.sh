@@ -7,17 +7,25 @@ source=$2
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
-# The functions and objects that headers declare at the beginning of a line.
+# The functions and objects that headers declare at the beginning of a line, in C.
 declared() {
-  sed -nE -e 's/^[A-Za-z_][A-Za-z0-9_ *]*[ *](Mp?_[A-Za-z0-9_]+)\(.*/\1/p' \
+  sed -nE -e '/M_EqualMatrixWithinEpsilon|M_GetMatrix3DeterminantPlus/d' \
+    -e 's/^[A-Za-z_][A-Za-z0-9_ *&]*[ *&](Mp?_[A-Za-z0-9_]+)\(.*/\1/p' \
     -e 's/^extern [A-Za-z0-9_ ]*[ *](Mp?_[A-Za-z0-9_]+)(\[[0-9]+\])?;.*/\1/p' "$@"
+}
+
+# Members and overloads, which the linker's script lists one by one, as they are written in C++.
+declared_cxx() {
+  sed -nE 's/^ +"(.+)";$/\1/p' "$source"/src/pkg/M/linux/M.map
 }
 
 {
   declared "$source"/include/*.h | sed 's/$/@@M_1/'
   declared "$source"/src/pkg/M/indep/Mp_*.h | sed 's/$/@@M_PRIVATE/'
+  declared_cxx | sed 's/$/@@M_1/'
 } | sort >"$work/declared"
-nm -D --defined-only --with-symbol-versions "$library" | awk '$2 != "A" { print $3 }' | sort >"$work/exported"
+nm -DC --defined-only --with-symbol-versions "$library" | sed -E 's/^[0-9a-f]* //' |
+  sed -n 's/^[^A] //p' | sort >"$work/exported"
 
 [ "$(wc -l <"$work/declared")" -gt 60 ] || { echo "the headers could not be read"; exit 1; }
 diff "$work/declared" "$work/exported" || { echo "< declared, > exported"; exit 1; }

@@ -6,15 +6,20 @@
 
 #include <cstdint>
 #include <limits>
+#include <type_traits>
 
 namespace Mp {
 
-constexpr int32_t WrapAdd(int32_t a, int32_t b) {
-  return static_cast<int32_t>(static_cast<uint32_t>(a) + static_cast<uint32_t>(b));
+template <class Int>
+constexpr Int WrapAdd(Int a, Int b) {
+  using Unsigned = std::make_unsigned_t<Int>;
+  return static_cast<Int>(static_cast<Unsigned>(a) + static_cast<Unsigned>(b));
 }
 
-constexpr int32_t WrapSub(int32_t a, int32_t b) {
-  return static_cast<int32_t>(static_cast<uint32_t>(a) - static_cast<uint32_t>(b));
+template <class Int>
+constexpr Int WrapSub(Int a, Int b) {
+  using Unsigned = std::make_unsigned_t<Int>;
+  return static_cast<Int>(static_cast<Unsigned>(a) - static_cast<Unsigned>(b));
 }
 
 constexpr int32_t WrapMul(int32_t a, int32_t b) {

@@ -18,7 +18,11 @@ enum : int16_t {
   Mp_PLACE_SHORT_CONV_RATIO = 19,
   Mp_PLACE_PREPARE_FCMD = 31,
   Mp_PLACE_UNPREPARE_FCMD = 32,
+  Mp_PLACE_INVERSE_MATRIX = 35,
+  Mp_PLACE_TRANSFORM_POINTS = 38,
+  Mp_PLACE_TRANSFORM_FIX_POINTS = 39,
   Mp_PLACE_FTRIG = 42,
+  Mp_PLACE_MATRIX4 = 45,
 };
 
 /// Identifiers of the reports, and of the allocations, that go straight to the host.
@@ -35,6 +39,11 @@ enum : uint32_t {
   Mp_ID_SETDOWN_GAUSS = 0x11001E,
   Mp_ID_FCMD_UNAVAILABLE = 0x11001F,
   Mp_ID_FTRIG_UNAVAILABLE = 0x11002A,
+  Mp_ID_NORMALIZE = 0x110037,
+  Mp_ID_TRANSFORM_POINT3 = 0x110039,
+  Mp_ID_TRANSFORM_POINTS3 = 0x11003A,
+  Mp_ID_TRANSFORM_POINT4 = 0x11003B,
+  Mp_ID_TRANSFORM_POINTS4 = 0x11003C,
 };
 
 /// Severities and error numbers that mean something to the host only.
