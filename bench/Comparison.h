@@ -12,8 +12,23 @@
 
 namespace bench {
 
-/// Gives a line its place in the table, that of its first mention.
-void NoteLine(const std::string& what);
+/// Gives a line its place in the table, that of its first mention, and says how many items one run
+/// of its work deals with: times are shown for one.
+void NoteLine(const std::string& what, int items = 1);
+
+/// Measures work(), which deals with `items` items, in ns an item, as line `what` of `subject`.
+template <class Work>
+void Batch(const std::string& what, const std::string& subject, int items, Work work) {
+  NoteLine(what, items);
+  const auto run = [work](benchmark::State& state) {
+    for (auto unused : state) {
+      (void)unused;
+      work();
+      benchmark::ClobberMemory();
+    }
+  };
+  benchmark::RegisterBenchmark((what + '/' + subject).c_str(), run);
+}
 
 /// Measures work(operand) over all operands, in ns an operand, as line `what` of `subject`. The
 /// subject "M" is ours; every other one is a peer.

@@ -26,47 +26,78 @@ int32_t ReportFailure(int16_t place, int32_t code, bool isReportable) {
   return isReportable ? Mp_ReportErr(place, code, 0) : code;
 }
 
-bool IsTooSmallAPivot(double pivot) { return -1e-20 < pivot && pivot < 1e-20; }
-
 // Gauss-Jordan elimination: what makes the left matrix the identity makes the right one, which was
-// the identity, the inverse.
+// the identity, the inverse. Rows are known when it is compiled, so that both matrices stay in
+// registers.
 class Elimination {
  public:
-  explicit Elimination(const M_Matrix3& left) : left_(left), right_(Mp::kIdentity3) {}
+  [[gnu::always_inline]] explicit Elimination(const M_Matrix3& left)
+      : left_(left), right_(Mp::kIdentity3) {}
 
-  const M_Matrix3& Right() const { return right_; }
-
-  // Of three rows the one that is largest in column 0, of equals the last.
-  int FirstPivot() const {
+  // The first pivot is the largest element of column 0, of equals the last.
+  [[gnu::always_inline]] int32_t Invert(M_Matrix3* dst, bool* reportable) {
     const double a = std::abs(left_.m[0][0]);
     const double b = std::abs(left_.m[1][0]);
     const double c = std::abs(left_.m[2][0]);
-    return a > b && a > c ? 0 : b > c ? 1 : 2;
+    if (a > b && a > c) return InvertFrom<0, 1, 2>(dst, reportable);
+    if (b > c) return InvertFrom<1, 0, 2>(dst, reportable);
+    return InvertFrom<2, 0, 1>(dst, reportable);
   }
 
-  // Of two rows, likewise in column 1.
-  int SecondPivot(int row, int laterRow) const {
-    return std::abs(left_.m[row][1]) > std::abs(left_.m[laterRow][1]) ? row : laterRow;
+ private:
+  // The second pivot is the larger element of column 1 in the other rows, of equals the later.
+  template <int kFirst, int kRow, int kLaterRow>
+  [[gnu::always_inline]] int32_t InvertFrom(M_Matrix3* dst, bool* reportable) {
+    if (!Reduce<0, kFirst, kRow, kLaterRow>()) return Fail(dst, reportable);
+    return std::abs(left_.m[kRow][1]) > std::abs(left_.m[kLaterRow][1])
+               ? InvertFromSecond<kFirst, kRow, kLaterRow>(dst, reportable)
+               : InvertFromSecond<kFirst, kLaterRow, kRow>(dst, reportable);
+  }
+
+  template <int kFirst, int kSecond, int kThird>
+  [[gnu::always_inline]] int32_t InvertFromSecond(M_Matrix3* dst, bool* reportable) {
+    if (!Reduce<1, kSecond, kFirst, kThird>()) return Fail(dst, reportable);
+    if (Reduce<2, kThird, kFirst, kSecond>()) {
+      const auto& a = right_.m;
+      *dst = {{{a[kFirst][0], a[kFirst][1], a[kFirst][2]},
+               {a[kSecond][0], a[kSecond][1], a[kSecond][2]},
+               {a[kThird][0], a[kThird][1], a[kThird][2]}}};
+    } else {
+      // Kept on purpose: a zero last pivot is no failure. The result is 0 and dst stays half-way,
+      // its rows not yet in order.
+      *dst = right_;
+    }
+    return 0;
   }
 
   // Makes column c 1 in the pivot's row and 0 in the others. False, with nothing done, for a pivot
   // that is too small. Left of c nothing is looked at any more.
-  bool Reduce(int c, int pivotRow, int otherRow1, int otherRow2) {
-    const double pivot = left_.m[pivotRow][c];
-    if (IsTooSmallAPivot(pivot)) return false;
+  template <int kColumn, int kPivot, int kOther1, int kOther2>
+  [[gnu::always_inline]] bool Reduce() {
+    const double pivot = left_.m[kPivot][kColumn];
+    if (-1e-20 < pivot && pivot < 1e-20) return false;
     const double r = 1.0 / pivot;
-    for (int j = c + 1; j < 3; ++j) left_.m[pivotRow][j] *= r;
-    for (double& element : right_.m[pivotRow]) element *= r;
-    for (const int row : {otherRow1, otherRow2}) {
-      const double factor = left_.m[row][c];
-      for (int j = c + 1; j < 3; ++j) left_.m[row][j] -= factor * left_.m[pivotRow][j];
-      // Whole rows, zeros included.
-      for (int j = 0; j < 3; ++j) right_.m[row][j] -= factor * right_.m[pivotRow][j];
-    }
+    for (int j = kColumn + 1; j < 3; ++j) left_.m[kPivot][j] *= r;
+    for (int j = 0; j < 3; ++j) right_.m[kPivot][j] *= r;
+    Subtract<kColumn, kPivot, kOther1>();
+    Subtract<kColumn, kPivot, kOther2>();
     return true;
   }
 
- private:
+  // Whole rows on the right, zeros included.
+  template <int kColumn, int kPivot, int kRow>
+  [[gnu::always_inline]] void Subtract() {
+    const double factor = left_.m[kRow][kColumn];
+    for (int j = kColumn + 1; j < 3; ++j) left_.m[kRow][j] -= factor * left_.m[kPivot][j];
+    for (int j = 0; j < 3; ++j) right_.m[kRow][j] -= factor * right_.m[kPivot][j];
+  }
+
+  [[gnu::always_inline]] int32_t Fail(M_Matrix3* dst, bool* reportable) const {
+    *dst = right_;
+    Mp::Store(reportable, true);
+    return M_ERR_NOT_INVERTIBLE;
+  }
+
   M_Matrix3 left_;
   M_Matrix3 right_;
 };
@@ -76,13 +107,6 @@ void MinorsOfRow(const double* row0, const double* row1, const double* row2, dou
   minors[1] = Mp::Determinant(row0, row1, row2, 0, 2, 3);
   minors[2] = Mp::Determinant(row0, row1, row2, 0, 1, 3);
   minors[3] = Mp::Determinant(row0, row1, row2, 0, 1, 2);
-}
-
-// The transposed minors with the signs of a chess board.
-void Adjugate(const M_Matrix4& minors, M_Matrix4* out) {
-  for (int i = 0; i < 4; ++i) {
-    for (int j = 0; j < 4; ++j) out->m[i][j] = (i + j) % 2 == 0 ? minors.m[j][i] : -minors.m[j][i];
-  }
 }
 
 }  // namespace
@@ -168,36 +192,8 @@ int32_t M_GetMatrixType(const M_Matrix3* m, uint32_t* type) {
 }
 
 int32_t M_InverseMatrixQuiet(const M_Matrix3* src, M_Matrix3* dst, bool* reportable) {
-  Elimination elimination(*src);
   Mp::Store(reportable, false);
-  const auto fail = [&] {
-    *dst = elimination.Right();
-    Mp::Store(reportable, true);
-    return M_ERR_NOT_INVERTIBLE;
-  };
-
-  const int first = elimination.FirstPivot();
-  const int row = first == 0 ? 1 : 0;
-  const int laterRow = first == 2 ? 1 : 2;
-  if (!elimination.Reduce(0, first, row, laterRow)) return fail();
-
-  const int second = elimination.SecondPivot(row, laterRow);
-  const int third = row + laterRow - second;
-  if (!elimination.Reduce(1, second, first, third)) return fail();
-
-  // Kept on purpose: a zero last pivot is no failure. The result is 0 and dst stays half-way, its
-  // rows not yet in order.
-  if (!elimination.Reduce(2, third, first, second)) {
-    *dst = elimination.Right();
-    return 0;
-  }
-  const auto& inverse = elimination.Right().m;
-  for (int j = 0; j < 3; ++j) {
-    dst->m[0][j] = inverse[first][j];
-    dst->m[1][j] = inverse[second][j];
-    dst->m[2][j] = inverse[third][j];
-  }
-  return 0;
+  return Elimination(*src).Invert(dst, reportable);
 }
 
 int32_t M_InverseMatrix(const M_Matrix3* src, M_Matrix3* dst) {
@@ -237,9 +233,11 @@ int32_t M_ConcatMatrix4(const M_Matrix4* a, const M_Matrix4* b, M_Matrix4* out) 
 }
 
 int32_t M_TransposeMatrix4(const M_Matrix4* src, M_Matrix4* dst) {
-  M_Matrix4 transposed = *src;
-  transposed.Transpose();
-  *dst = transposed;
+  const auto& a = src->m;
+  *dst = {{{a[0][0], a[1][0], a[2][0], a[3][0]},
+           {a[0][1], a[1][1], a[2][1], a[3][1]},
+           {a[0][2], a[1][2], a[2][2], a[3][2]},
+           {a[0][3], a[1][3], a[2][3], a[3][3]}}};
   return 0;
 }
 
@@ -248,19 +246,20 @@ int32_t M_GetMatrix4Determinant(const M_Matrix4* m, double* det) {
 }
 
 int32_t M_InverseMatrix4Quiet(const M_Matrix4* src, M_Matrix4* dst, bool* reportable) {
-  Mp::Store(reportable, false);
   double det;
   M_Matrix4 minors;
   M_GetMatrix3DeterminantPlus(src, &det, &minors);
-  Adjugate(minors, dst);
-  if (std::abs(det) < 1e-16) {
-    Mp::Store(reportable, true);
-    return M_ERR_NOT_INVERTIBLE;
+  const bool isSingular = std::abs(det) < 1e-16;
+  // Divided by 1 the adjugate stays as it is.
+  const double divisor = isSingular ? 1.0 : det;
+  for (int i = 0; i < 4; ++i) {
+    for (int j = 0; j < 4; ++j) {
+      const double minor = minors.m[j][i];
+      dst->m[i][j] = ((i + j) % 2 == 0 ? minor : -minor) / divisor;
+    }
   }
-  for (auto& row : dst->m) {
-    for (double& element : row) element /= det;
-  }
-  return 0;
+  Mp::Store(reportable, isSingular);
+  return isSingular ? M_ERR_NOT_INVERTIBLE : 0;
 }
 
 int32_t M_InverseMatrix4(const M_Matrix4* src, M_Matrix4* dst) {

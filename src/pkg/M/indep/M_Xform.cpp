@@ -1,20 +1,17 @@
 // Points, vectors and rectangles transformed by matrices.
 //
-// A batch goes through a kernel, which transforms whole blocks of points, as many as fit the
-// vectors of the processor. The same source is compiled for the baseline and for AVX2, and which
-// one runs is decided when it is called.
+// A batch goes through a kernel, which transforms a block of points, as many as suit the vectors of
+// the processor. The same source is compiled for the baseline and for AVX2, and which one runs is
+// decided when it is called.
 
 #include <algorithm>
 #include <bit>
 #include <cmath>
-#include <iterator>
-#include <limits>
 
 #include "M_Matrix.h"
 #include "M_Rect.h"
 #include "Mp_Arith.h"
 #include "Mp_Err.h"
-#include "Mp_Out.h"
 #include "Mp_Rect.h"
 #include "Mp_Round.h"
 #include "Mp_Tolerance.h"
@@ -22,313 +19,191 @@
 
 namespace {
 
-using Mp::Lanes;
-using Mp::Triples;
-
 template <int kLanes>
-using Doubles = typename Lanes<kLanes>::Doubles;
+using Doubles = typename Mp::Lanes<kLanes>::Doubles;
+template <int kLanes>
+using Bits = typename Mp::Lanes<kLanes>::Bits;
 
 // ---------------------------------------------------------------------------------------------
-// Which vectors
-// ---------------------------------------------------------------------------------------------
-
-template <class Kernel, int kLanes>
-[[gnu::noinline]] int32_t Blocks(const typename Kernel::Matrix& m, int32_t count,
-                                 typename Kernel::Point* points) {
-  return Kernel::template Run<kLanes>(m, count, points);
-}
-
-#if defined(__x86_64__) && !defined(M_BASELINE_VECTORS)
-constexpr int kMostLanes = 4;
-
-template <class Kernel>
-[[gnu::noinline, gnu::target("avx2")]] int32_t WideBlocks(const typename Kernel::Matrix& m,
-                                                          int32_t count,
-                                                          typename Kernel::Point* points) {
-  return Kernel::template Run<kMostLanes>(m, count, points);
-}
-
-bool HasWideVectors() { return __builtin_cpu_supports("avx2"); }
-#else
-constexpr int kMostLanes = 2;
-
-template <class Kernel>
-int32_t WideBlocks(const typename Kernel::Matrix& m, int32_t count,
-                   typename Kernel::Point* points) {
-  return Blocks<Kernel, kMostLanes>(m, count, points);
-}
-
-bool HasWideVectors() { return true; }
-#endif
-
-// Transforms whole blocks, at most `count` points, and returns how many points that were.
-template <class Kernel>
-int32_t TransformBlocks(const typename Kernel::Matrix& m, int32_t count,
-                        typename Kernel::Point* points) {
-  return HasWideVectors() ? WideBlocks<Kernel>(m, count, points)
-                          : Blocks<Kernel, 2>(m, count, points);
-}
-
-// What is left over fills a block of its own, so that every point goes through the same
-// instructions. That leaves no room even for the sign of a NaN, which is that of one operand of a
-// sum or the other, as the compiler has placed them.
-template <class Kernel>
-int32_t TransformAll(const typename Kernel::Matrix* m, int32_t count,
-                     typename Kernel::Point* points) {
-  if (count < 1) return 0;
-  const int32_t done = TransformBlocks<Kernel>(*m, count, points);
-  if (done < count) {
-    typename Kernel::Point block[kMostLanes] = {};
-    std::copy(points + done, points + count, block);
-    TransformBlocks<Kernel>(*m, kMostLanes, block);
-    std::copy_n(block, count - done, points + done);
-  }
-  return 0;
-}
-
-// ---------------------------------------------------------------------------------------------
-// Kernels. Run<kLanes>(m, count, points) transforms whole blocks of at most kMostLanes points, in
-// place, and returns how many points it has transformed.
+// Kernels of points that cannot fail: made from a matrix, Transform turns a block of kBlock points.
 // ---------------------------------------------------------------------------------------------
 
 // 2D points, as many as fit one vector.
-struct FloatPoints {
-  using Matrix = M_Matrix3;
-  using Point = M_Vector2T<double>;
+template <int kLanes>
+class FloatPoints {
+ public:
+  static constexpr int kBlock = kLanes / 2;
 
-  template <int kLanes>
-  [[gnu::always_inline]] static int32_t Run(const Matrix& m, int32_t count, Point* points) {
-    using V = Doubles<kLanes>;
-    constexpr int kBlock = kLanes / 2;
-    const V byX = Row<kLanes>(m.m[0]);
-    const V byY = Row<kLanes>(m.m[1]);
-    const V translation = Row<kLanes>(m.m[2]);
-    int32_t i = 0;
-    for (; i <= count - kBlock; i += kBlock) {
-      const V xy = Mp::Load<V>(points + i);
-      V x, y;
-      if constexpr (kLanes == 2) {
-        x = __builtin_shufflevector(xy, xy, 0, 0);
-        y = __builtin_shufflevector(xy, xy, 1, 1);
-      } else {
-        x = __builtin_shufflevector(xy, xy, 0, 0, 2, 2);
-        y = __builtin_shufflevector(xy, xy, 1, 1, 3, 3);
-      }
-      Mp::Store(points + i, byX * x + byY * y + translation);
+  [[gnu::always_inline]] explicit FloatPoints(const M_Matrix3& m)
+      : diagonal_(Repeat(m.m[0][0], m.m[1][1])),
+        crosswise_(Repeat(m.m[1][0], m.m[0][1])),
+        translation_(Repeat(m.m[2][0], m.m[2][1])) {}
+
+  [[gnu::always_inline]] void Transform(M_Vector2T<double>* points) const {
+    const auto xy = Mp::Load<V>(points);
+    V yx;
+    if constexpr (kLanes == 2) {
+      yx = __builtin_shufflevector(xy, xy, 1, 0);
+    } else {
+      yx = __builtin_shufflevector(xy, xy, 1, 0, 3, 2);
     }
-    return i;
+    Mp::Store(points, diagonal_ * xy + crosswise_ * yx + translation_);
   }
 
  private:
-  template <int kLanes>
-  [[gnu::always_inline]] static Doubles<kLanes> Row(const double* row) {
+  using V = Doubles<kLanes>;
+
+  [[gnu::always_inline]] static V Repeat(double even, double odd) {
     if constexpr (kLanes == 2) {
-      return Doubles<2>{row[0], row[1]};
+      return V{even, odd};
     } else {
-      return Doubles<4>{row[0], row[1], row[0], row[1]};
+      return V{even, odd, even, odd};
     }
   }
+
+  V diagonal_, crosswise_, translation_;
 };
 
 // (x, y, z) x m.
-struct Vectors3 {
-  using Matrix = M_Matrix3;
-  using Point = M_Vector3T<double>;
+template <int kLanes>
+class Vectors3 {
+ public:
+  static constexpr int kBlock = kLanes;
 
-  template <int kLanes>
-  [[gnu::always_inline]] static int32_t Run(const Matrix& matrix, int32_t count, Point* points) {
-    const Matrix m = matrix;
-    const auto& a = m.m;
-    int32_t i = 0;
-    for (; i <= count - kLanes; i += kLanes) {
-      const auto p = Triples<kLanes>::Load(&points[i].x);
-      const Triples<kLanes> transformed = {a[0][0] * p.x + a[1][0] * p.y + a[2][0] * p.z,
-                                           a[0][1] * p.x + a[1][1] * p.y + a[2][1] * p.z,
-                                           a[0][2] * p.x + a[1][2] * p.y + a[2][2] * p.z};
-      transformed.Store(&points[i].x);
-    }
-    return i;
+  explicit Vectors3(const M_Matrix3& m) : m_(m) {}
+
+  [[gnu::always_inline]] void Transform(M_Vector3T<double>* vectors) const {
+    const auto& a = m_.m;
+    const auto p = Mp::Triples<kLanes>::Load(&vectors->x);
+    const Mp::Triples<kLanes> transformed = {a[0][0] * p.x + a[1][0] * p.y + a[2][0] * p.z,
+                                             a[0][1] * p.x + a[1][1] * p.y + a[2][1] * p.z,
+                                             a[0][2] * p.x + a[1][2] * p.y + a[2][2] * p.z};
+    transformed.Store(&vectors->x);
   }
+
+ private:
+  const M_Matrix3& m_;
 };
 
-// 1 / w, and 1 where w counts as zero: times 1 is not divided.
+// What a point is multiplied by instead of a division, and its w then. Where w counts as zero the
+// factor is 1, which leaves a point as it is, and w is kept.
 template <int kLanes>
-[[gnu::always_inline]] inline Doubles<kLanes> Reciprocal(const Doubles<kLanes>& w) {
-  const auto isNearZero = (w > -Mp::kTolerance) & (w < Mp::kTolerance);
-  const Doubles<kLanes> ones = Doubles<kLanes>{} + 1.0;
-  return 1.0 / (isNearZero ? ones : w);
-}
+struct Divisor {
+  Doubles<kLanes> factor, w;
+
+  [[gnu::always_inline]] explicit Divisor(const Doubles<kLanes>& given) {
+    const auto ones = Doubles<kLanes>{} + 1.0;
+    // |w|, by its bits.
+    const auto magnitude = (Doubles<kLanes>)((Bits<kLanes>)given & INT64_MAX);
+    const auto isNearZero = (Bits<kLanes>)(magnitude < Mp::kTolerance);
+    // The bits in which 1 and w differ.
+    const auto difference = ((Bits<kLanes>)ones ^ (Bits<kLanes>)given) & isNearZero;
+    factor = 1.0 / (Doubles<kLanes>)((Bits<kLanes>)given ^ difference);
+    w = (Doubles<kLanes>)((Bits<kLanes>)ones ^ difference);
+  }
+};
 
 // (x, y, z, 1) x m, divided by w.
-struct Points3 {
-  using Matrix = M_Matrix4;
-  using Point = M_Vector3T<double>;
+template <int kLanes>
+class Points3 {
+ public:
+  static constexpr int kBlock = kLanes;
 
-  template <int kLanes>
-  [[gnu::always_inline]] static int32_t Run(const Matrix& matrix, int32_t count, Point* points) {
-    const Matrix m = matrix;
-    const auto& a = m.m;
-    int32_t i = 0;
-    for (; i <= count - kLanes; i += kLanes) {
-      const auto p = Triples<kLanes>::Load(&points[i].x);
-      const auto w = a[0][3] * p.x + a[1][3] * p.y + a[2][3] * p.z + a[3][3];
-      const auto r = Reciprocal<kLanes>(w);
-      const Triples<kLanes> transformed = {
-          (a[0][0] * p.x + a[1][0] * p.y + a[2][0] * p.z + a[3][0]) * r,
-          (a[0][1] * p.x + a[1][1] * p.y + a[2][1] * p.z + a[3][1]) * r,
-          (a[0][2] * p.x + a[1][2] * p.y + a[2][2] * p.z + a[3][2]) * r};
-      transformed.Store(&points[i].x);
-    }
-    return i;
+  explicit Points3(const M_Matrix4& m) : m_(m) {}
+
+  [[gnu::always_inline]] void Transform(M_Vector3T<double>* points) const {
+    const auto& a = m_.m;
+    const auto p = Mp::Triples<kLanes>::Load(&points->x);
+    const auto column = [&](int j) __attribute__((always_inline)) {
+      return a[0][j] * p.x + a[1][j] * p.y + a[2][j] * p.z + a[3][j];
+    };
+    const Divisor<kLanes> divisor(column(3));
+    const Mp::Triples<kLanes> transformed = {column(0) * divisor.factor, column(1) * divisor.factor,
+                                             column(2) * divisor.factor};
+    transformed.Store(&points->x);
   }
+
+ private:
+  const M_Matrix4& m_;
 };
 
-// A matrix of 4 x 4 as the vectors of its rows: one each, or two of two lanes.
+// (x, y, z, w) x m, in parts of kLanes coordinates.
 template <int kLanes>
-struct Rows {
+class Vectors4 {
+ public:
+  static constexpr int kBlock = 1;
   static constexpr int kParts = 4 / kLanes;
   using V = Doubles<kLanes>;
-  V parts[4][kParts];
 
-  [[gnu::always_inline]] explicit Rows(const M_Matrix4& m) {
+  [[gnu::always_inline]] explicit Vectors4(const M_Matrix4& m) {
     for (int i = 0; i < 4; ++i) {
-      for (int j = 0; j < kParts; ++j) parts[i][j] = Mp::Load<V>(&m.m[i][j * kLanes]);
+      for (int part = 0; part < kParts; ++part) {
+        rows_[i][part] = Mp::Load<V>(&m.m[i][part * kLanes]);
+      }
+    }
+  }
+
+  [[gnu::always_inline]] V Part(const M_Vector4T<double>& p, int part) const {
+    return p.x * rows_[0][part] + p.y * rows_[1][part] + p.z * rows_[2][part] +
+           p.w * rows_[3][part];
+  }
+
+  [[gnu::always_inline]] void Transform(M_Vector4T<double>* vector) const {
+    const M_Vector4T<double> p = *vector;
+    for (int part = 0; part < kParts; ++part) {
+      Mp::Store(&vector->x + part * kLanes, Part(p, part));
     }
   }
 
-  // One part of p x m.
-  [[gnu::always_inline]] V Transform(const M_Vector4T<double>& p, int part) const {
-    return p.x * parts[0][part] + p.y * parts[1][part] + p.z * parts[2][part] +
-           p.w * parts[3][part];
-  }
+ private:
+  V rows_[4][kParts];
 };
 
-struct Vectors4 {
-  using Matrix = M_Matrix4;
-  using Point = M_Vector4T<double>;
+// (x, y, z, w) x m, divided by w. The divisions of a block are one division of a vector.
+template <int kLanes>
+class Points4 {
+ public:
+  static constexpr int kBlock = kLanes;
 
-  template <int kLanes>
-  [[gnu::always_inline]] static int32_t Run(const Matrix& m, int32_t count, Point* points) {
-    const Rows<kLanes> rows(m);
-    for (int32_t i = 0; i < count; ++i) {
-      const Point p = points[i];
-      for (int part = 0; part < rows.kParts; ++part) {
-        Mp::Store(&points[i].x + part * kLanes, rows.Transform(p, part));
-      }
+  [[gnu::always_inline]] explicit Points4(const M_Matrix4& m) : vectors_(m) {}
+
+  [[gnu::always_inline]] void Transform(M_Vector4T<double>* points) const {
+    constexpr int kLast = Vectors4<kLanes>::kParts - 1;
+    V p[kLanes][kLast + 1];
+    for (int i = 0; i < kLanes; ++i) {
+      for (int part = 0; part <= kLast; ++part) p[i][part] = vectors_.Part(points[i], part);
     }
-    return count;
-  }
-};
-
-// (x, y, z, w) x m, divided by w.
-struct Points4 {
-  using Matrix = M_Matrix4;
-  using Point = M_Vector4T<double>;
-
-  template <int kLanes>
-  [[gnu::always_inline]] static int32_t Run(const Matrix& m, int32_t count, Point* points) {
-    using V = Doubles<kLanes>;
-    const Rows<kLanes> rows(m);
-    constexpr int kLast = Rows<kLanes>::kParts - 1;
-    const V ones = V{} + 1.0;
-    int32_t i = 0;
-    for (; i <= count - kLanes; i += kLanes) {
-      V p[kLanes][kLast + 1];
-      for (int k = 0; k < kLanes; ++k) {
-        for (int part = 0; part <= kLast; ++part) p[k][part] = rows.Transform(points[i + k], part);
-      }
-      // The divisions of a block are one division of a vector.
-      V w, end;
-      if constexpr (kLanes == 2) {
-        w = __builtin_shufflevector(p[0][kLast], p[1][kLast], 1, 3);
-      } else {
-        const V w01 = __builtin_shufflevector(p[0][kLast], p[1][kLast], 1, 5, 3, 7);
-        const V w23 = __builtin_shufflevector(p[2][kLast], p[3][kLast], 1, 5, 3, 7);
-        w = __builtin_shufflevector(w01, w23, 2, 3, 6, 7);
-      }
-      const V r = Reciprocal<kLanes>(w);
-      const auto isNearZero = (w > -Mp::kTolerance) & (w < Mp::kTolerance);
-      end = isNearZero ? w : ones;
-      for (int k = 0; k < kLanes; ++k) {
-        for (int part = 0; part <= kLast; ++part) {
-          V scaled = p[k][part] * r[k];
-          if (part == kLast) scaled[kLanes - 1] = end[k];
-          Mp::Store(&points[i + k].x + part * kLanes, scaled);
-        }
-      }
+    V w;
+    if constexpr (kLanes == 2) {
+      w = __builtin_shufflevector(p[0][kLast], p[1][kLast], 1, 3);
+    } else {
+      const V zw01 = __builtin_shufflevector(p[0][kLast], p[1][kLast], 1, 5, 3, 7);
+      const V zw23 = __builtin_shufflevector(p[2][kLast], p[3][kLast], 1, 5, 3, 7);
+      w = __builtin_shufflevector(zw01, zw23, 2, 3, 6, 7);
     }
-    return i;
+    const Divisor<kLanes> divisor(w);
+    for (int i = 0; i < kLanes; ++i) {
+      for (int part = 0; part <= kLast; ++part) {
+        Mp::Store(&points[i].x + part * kLanes, p[i][part] * divisor.factor[i]);
+      }
+      points[i].w = divisor.w[i];
+    }
   }
-};
 
-// ---------------------------------------------------------------------------------------------
-// Integer points: h and v rounded, within bounds
-// ---------------------------------------------------------------------------------------------
-
-// h and v of several points.
-template <int kLanes>
-struct Pairs {
-  using Ints = typename Lanes<kLanes>::Ints;
-  Ints h, v;
-};
-
-// One word a point.
-template <int kLanes>
-[[gnu::always_inline]] inline Pairs<kLanes> LoadPairs(const M_Point* points) {
-  using Ints = typename Lanes<kLanes>::Ints;
-  const auto words = Mp::Load<Ints>(points);
-  const Ints high = words >> 16;
-  const Ints low = words * 0x10000 >> 16;
-  if constexpr (std::endian::native == std::endian::little) return {high, low};
-  return {low, high};
-}
-
-template <int kLanes>
-[[gnu::always_inline]] inline void StorePairs(const Pairs<kLanes>& p, M_Point* points) {
-  const bool isLittle = std::endian::native == std::endian::little;
-  const auto high = isLittle ? p.h : p.v;
-  const auto low = isLittle ? p.v : p.h;
-  Mp::Store(points, high * 0x10000 | (low & 0xFFFF));
-}
-
-template <int kLanes>
-[[gnu::always_inline]] inline Pairs<kLanes> LoadPairs(const M_FixedPoint* points) {
-  using Ints = typename Lanes<kLanes>::Ints;
-  const auto a = Mp::Load<Ints>(points);
-  const auto b = Mp::Load<Ints>(points + kLanes / 2);
-  if constexpr (kLanes == 2) {
-    return {__builtin_shufflevector(a, b, 0, 2), __builtin_shufflevector(a, b, 1, 3)};
-  } else {
-    return {__builtin_shufflevector(a, b, 0, 2, 4, 6), __builtin_shufflevector(a, b, 1, 3, 5, 7)};
-  }
-}
-
-template <int kLanes>
-[[gnu::always_inline]] inline void StorePairs(const Pairs<kLanes>& p, M_FixedPoint* points) {
-  if constexpr (kLanes == 2) {
-    Mp::Store(points, __builtin_shufflevector(p.h, p.v, 0, 2));
-    Mp::Store(points + 1, __builtin_shufflevector(p.h, p.v, 1, 3));
-  } else {
-    Mp::Store(points, __builtin_shufflevector(p.h, p.v, 0, 4, 1, 5));
-    Mp::Store(points + 2, __builtin_shufflevector(p.h, p.v, 2, 6, 3, 7));
-  }
-}
-
-// Mp::RoundHalfUp for values that fit.
-template <int kLanes>
-[[gnu::always_inline]] inline typename Lanes<kLanes>::Ints Round(const Doubles<kLanes>& d) {
+ private:
   using V = Doubles<kLanes>;
-  using Ints = typename Lanes<kLanes>::Ints;
-  const V up = d + 0.5;
-  const V whole = __builtin_convertvector(__builtin_convertvector(up, Ints), V);
-  const V down = whole == up ? d : d - 0.5;
-  return __builtin_convertvector(d > 0.0 ? up : down, Ints);
-}
+  Vectors4<kLanes> vectors_;
+};
 
-// What a kind of integer point needs to know beside its coordinates. The upper bound is rejected,
-// though it would fit.
+// ---------------------------------------------------------------------------------------------
+// Kernel of integer points: h and v rounded, within bounds
+// ---------------------------------------------------------------------------------------------
+
+// What a kind of integer point needs to know beside its coordinates.
 struct ShortTraits {
   using Point = M_Point;
+  using Coord = int16_t;
+  static constexpr int kFieldOfH = 1;
   static constexpr double kUnit = 1.0;
   static constexpr double kLowest = -32768.0;
   static constexpr double kHighest = 32767.0;
@@ -338,6 +213,8 @@ struct ShortTraits {
 
 struct FixedTraits {
   using Point = M_FixedPoint;
+  using Coord = int32_t;
+  static constexpr int kFieldOfH = 0;
   static constexpr double kUnit = 65536.0;
   static constexpr double kLowest = -2147483648.0;
   static constexpr double kHighest = 2147483647.0;
@@ -345,61 +222,206 @@ struct FixedTraits {
   static constexpr int16_t kDetail = Mp_STR_IN_FIXED_POINT_TRANSFORMATION;
 };
 
-// Stops before a block with a result that is out of bounds, or a NaN.
-template <class Traits>
-struct IntegerPoints {
-  using Matrix = M_Matrix3;
-  using Point = typename Traits::Point;
+// A lane of 64 bits is one 16.16 point or two short ones: four or two fields. Integers come and go
+// as the last places of doubles of the magnitude of 2^52.
+template <class Traits, int kLanes>
+class IntegerPoints {
+ public:
+  static constexpr int kPointsInLane = 8 / sizeof(typename Traits::Point);
+  static constexpr int kBlock = kLanes * kPointsInLane;
 
-  template <int kLanes>
-  [[gnu::always_inline]] static int32_t Run(const Matrix& matrix, int32_t count, Point* points) {
-    using V = Doubles<kLanes>;
-    const Matrix m = matrix;
-    const auto& a = m.m;
-    const double tx = a[2][0] * Traits::kUnit;
-    const double ty = a[2][1] * Traits::kUnit;
-    int32_t i = 0;
-    for (; i <= count - kLanes; i += kLanes) {
-      const auto p = LoadPairs<kLanes>(points + i);
-      const V h = __builtin_convertvector(p.h, V);
-      const V v = __builtin_convertvector(p.v, V);
-      const V x = a[0][0] * h + a[1][0] * v + tx;
-      const V y = a[0][1] * h + a[1][1] * v + ty;
-      const auto isInside = (x < Traits::kHighest) & (x > Traits::kLowest) &
-                            (y < Traits::kHighest) & (y > Traits::kLowest);
-      if (!Mp::HoldsInAll<kLanes>(isInside)) break;
-      StorePairs<kLanes>({Round<kLanes>(x), Round<kLanes>(y)}, points + i);
+  explicit IntegerPoints(const M_Matrix3& m) : m_(m) {}
+
+  // Leaves the block as it is and returns false if a result is out of bounds or a NaN.
+  [[gnu::always_inline]] bool Transform(typename Traits::Point* points) const {
+    const auto& a = m_.m;
+    const auto fields = Mp::Load<B>(points);
+    B rounded = {};
+    B isInside = ~B{};
+    for (int i = 0; i < kPointsInLane; ++i) {
+      const int h = 2 * i + Traits::kFieldOfH;
+      const int v = 2 * i + 1 - Traits::kFieldOfH;
+      const V x = Get(fields, h);
+      const V y = Get(fields, v);
+      const double tx = a[2][0] * Traits::kUnit;
+      const double ty = a[2][1] * Traits::kUnit;
+      rounded |= Round(a[0][0] * x + a[1][0] * y + tx, &isInside) << Shift(h);
+      rounded |= Round(a[0][1] * x + a[1][1] * y + ty, &isInside) << Shift(v);
     }
-    return i;
-  }
-
-  // A coordinate of one point. False, with nothing stored, for one that is out of bounds.
-  template <class Int>
-  static bool Store(double value, Int* out) {
-    if (value >= Traits::kHighest || value <= Traits::kLowest) return false;
-    *out = static_cast<Int>(Mp::RoundHalfUp<int32_t>(value));
+    if (!Mp::HoldsInAll<kLanes>(isInside)) return false;
+    Mp::Store(points, rounded);
     return true;
   }
 
-  static int32_t Transform(const Matrix* matrix, int32_t count, Point* points) {
-    const auto& a = matrix->m;
-    const double tx = a[2][0] * Traits::kUnit;
-    const double ty = a[2][1] * Traits::kUnit;
-    for (int32_t i = 0; i < count;) {
-      i += TransformBlocks<IntegerPoints>(*matrix, count - i, points + i);
-      // The block at which the others stopped, or what is left over, point by point.
-      for (const int32_t end = i + std::min(count - i, kMostLanes); i < end; ++i) {
-        const double h = points[i].h;
-        const double v = points[i].v;
-        if (!Store(a[0][0] * h + a[1][0] * v + tx, &points[i].h) ||
-            !Store(a[0][1] * h + a[1][1] * v + ty, &points[i].v)) {
-          return Mp_ReportErr(Traits::kPlace, M_ERR_OVERFLOW, Traits::kDetail);
-        }
+ private:
+  using V = Doubles<kLanes>;
+  using B = Bits<kLanes>;
+
+  static constexpr int kBits = 8 * sizeof(typename Traits::Coord);
+  static constexpr uint64_t kField = ~uint64_t{0} >> (64 - kBits);
+
+  // Where a field starts, counted in the order of memory.
+  static constexpr int Shift(int field) {
+    return std::endian::native == std::endian::little ? field * kBits : 64 - (field + 1) * kBits;
+  }
+
+  [[gnu::always_inline]] static V Get(const B& fields, int field) {
+    // Without its sign a field is larger by half its range.
+    constexpr uint64_t kSign = (kField >> 1) + 1;
+    const V base = V{} + 0x1p52;
+    const B bits = (fields >> Shift(field) & kField) ^ kSign;
+    return (V)(bits | (B)base) - (0x1p52 + static_cast<double>(kSign));
+  }
+
+  // As Mp::RoundHalfUp, but modulo the range of a field; clears the lanes of `isInside` that are
+  // out of bounds or a NaN.
+  [[gnu::always_inline]] static B Round(const V& d, B* isInside) {
+    // Rounds what is added to a whole number, in its last places.
+    constexpr double kWhole = 0x1.8p52;
+    // The one value below 0 where the sum with 0.5 lies in another whole number than the
+    // difference.
+    constexpr double kBelowHalf = -0x1.fffffffffffffp-2;
+    const V up = d + 0.5;
+    // Both bounds in one: where they lie the sum is exact.
+    const auto magnitude = (V)((B)up & INT64_MAX);
+    *isInside &= (B)(magnitude < Traits::kHighest + 0.5);
+    const V whole = up + kWhole;
+    const auto isTooHigh = (B)(whole - kWhole > up) | (B)(d == kBelowHalf);
+    // A comparison that holds is -1.
+    return ((B)whole + isTooHigh) & kField;
+  }
+
+  const M_Matrix3& m_;
+};
+static_assert(ShortTraits::kHighest + 0.5 == -(ShortTraits::kLowest + 0.5));
+static_assert(FixedTraits::kHighest + 0.5 == -(FixedTraits::kLowest + 0.5));
+
+// ---------------------------------------------------------------------------------------------
+// Batches
+// ---------------------------------------------------------------------------------------------
+
+template <template <int> class Kernel, class Matrix, class Point>
+void TransformBatch(const Matrix* m, int32_t count, Point* points);
+
+// What is left over fills a block of its own and goes through the same instructions. That leaves no
+// room even for the sign of a NaN, which is that of one operand of a sum or the other, as the
+// compiler has placed them.
+template <template <int> class Kernel, int kBlock, class Matrix, class Point>
+[[gnu::noinline]] void TransformLeft(const Matrix* m, int32_t count, Point* points) {
+  Point block[kBlock] = {};
+  std::copy_n(points, count, block);
+  TransformBatch<Kernel>(m, kBlock, block);
+  std::copy_n(block, count, points);
+}
+
+// From so many points on, vectors that lie across two lines of the cache cost more than a detour of
+// the first points.
+constexpr int32_t kWorthAligning = 256;
+
+// How many points, fewer than a block, lie before the first aligned one; 0 if none is aligned.
+template <int kAlignment, int kBlock, class Point>
+int32_t PointsBeforeAligned(const Point* points) {
+  const auto address = reinterpret_cast<uintptr_t>(points);
+  for (int32_t i = 1; i < kBlock; ++i) {
+    if ((address + i * sizeof(Point)) % kAlignment == 0) return i;
+  }
+  return 0;
+}
+
+template <template <int> class Kernel, int kLanes, class Matrix, class Point>
+[[gnu::always_inline]] inline void TransformInLanes(const Matrix* m, int32_t count, Point* points) {
+  constexpr int kBlock = Kernel<kLanes>::kBlock;
+  if (count >= kWorthAligning) {
+    const int32_t head = PointsBeforeAligned<kLanes * sizeof(double), kBlock>(points);
+    if (head > 0) {
+      TransformLeft<Kernel, kBlock>(m, head, points);
+      points += head;
+      count -= head;
+    }
+  }
+  const Kernel<kLanes> kernel(*m);
+  for (; count >= kBlock; count -= kBlock, points += kBlock) kernel.Transform(points);
+  if constexpr (kBlock > 1) {
+    if (count > 0) TransformLeft<Kernel, kBlock>(m, count, points);
+  }
+}
+
+// Whole blocks until one fails; returns the number of points that are done.
+template <class Kernel, class Point>
+[[gnu::always_inline]] inline int32_t TransformWhileInside(const M_Matrix3* m, int32_t count,
+                                                           Point* points) {
+  const Kernel kernel(*m);
+  int32_t done = 0;
+  while (done <= count - Kernel::kBlock && kernel.Transform(points + done)) done += Kernel::kBlock;
+  return done;
+}
+
+#if defined(__x86_64__) && !defined(M_BASELINE_VECTORS)
+
+bool HasAvx2() { return __builtin_cpu_supports("avx2"); }
+
+template <template <int> class Kernel, class Matrix, class Point>
+[[gnu::target("avx2")]] void TransformWithAvx2(const Matrix* m, int32_t count, Point* points) {
+  TransformInLanes<Kernel, 4>(m, count, points);
+}
+
+template <class Traits>
+[[gnu::target("avx2")]] int32_t TransformWhileInsideWithAvx2(const M_Matrix3* m, int32_t count,
+                                                             typename Traits::Point* points) {
+  int32_t done = TransformWhileInside<IntegerPoints<Traits, 4>>(m, count, points);
+  done += TransformWhileInside<IntegerPoints<Traits, 2>>(m, count - done, points + done);
+  return done;
+}
+
+#else
+
+// Never called.
+constexpr bool HasAvx2() { return false; }
+template <template <int> class Kernel, class Matrix, class Point>
+void TransformWithAvx2(const Matrix*, int32_t, Point*) {}
+template <class Traits>
+int32_t TransformWhileInsideWithAvx2(const M_Matrix3*, int32_t, typename Traits::Point*) {
+  return 0;
+}
+
+#endif
+
+template <template <int> class Kernel, class Matrix, class Point>
+void TransformBatch(const Matrix* m, int32_t count, Point* points) {
+  if (HasAvx2()) return TransformWithAvx2<Kernel>(m, count, points);
+  TransformInLanes<Kernel, 2>(m, count, points);
+}
+
+// A coordinate of one point. False, with nothing stored, for one that is out of bounds: the upper
+// one is, though it would fit.
+template <class Traits>
+bool StoreRounded(double value, typename Traits::Coord* out) {
+  if (value >= Traits::kHighest || value <= Traits::kLowest) return false;
+  *out = static_cast<typename Traits::Coord>(Mp::RoundHalfUp<int32_t>(value));
+  return true;
+}
+
+template <class Traits>
+int32_t TransformIntegers(const M_Matrix3* m, int32_t count, typename Traits::Point* points) {
+  const auto& a = m->m;
+  const double tx = a[2][0] * Traits::kUnit;
+  const double ty = a[2][1] * Traits::kUnit;
+  for (int32_t i = 0; i < count;) {
+    i += HasAvx2() ? TransformWhileInsideWithAvx2<Traits>(m, count - i, points + i)
+                   : TransformWhileInside<IntegerPoints<Traits, 2>>(m, count - i, points + i);
+    // The block at which that stopped, or what is left over, point by point.
+    constexpr int32_t kBlock = IntegerPoints<Traits, 2>::kBlock;
+    for (const int32_t end = i + std::min(count - i, kBlock); i < end; ++i) {
+      const double h = points[i].h;
+      const double v = points[i].v;
+      if (!StoreRounded<Traits>(a[0][0] * h + a[1][0] * v + tx, &points[i].h) ||
+          !StoreRounded<Traits>(a[0][1] * h + a[1][1] * v + ty, &points[i].v)) {
+        return Mp_ReportErr(Traits::kPlace, M_ERR_OVERFLOW, Traits::kDetail);
       }
     }
-    return 0;
   }
-};
+  return 0;
+}
 
 // ---------------------------------------------------------------------------------------------
 // Rectangles
@@ -431,7 +453,7 @@ M_FloatRect TransformCorners(const M_Matrix3& m, const M_FloatRect& r,
   M_Vector2T<double> own[kCorners];
   if (!corners) corners = own;
   Corners(r, corners);
-  TransformAll<FloatPoints>(&m, kCorners, corners);
+  TransformBatch<FloatPoints>(&m, kCorners, corners);
   return Bounds(corners);
 }
 
@@ -462,31 +484,36 @@ int32_t StoreIsBoundingBox(const M_Matrix3* m, unsigned char* isBoundingBox) {
 extern "C" {
 
 int32_t M_TransformFloatPoints(const M_Matrix3* m, int32_t count, M_Vector2T<double>* points) {
-  return TransformAll<FloatPoints>(m, count, points);
+  TransformBatch<FloatPoints>(m, count, points);
+  return 0;
 }
 
 int32_t M_TransformPoints(const M_Matrix3* m, int32_t count, M_Point* points) {
-  return IntegerPoints<ShortTraits>::Transform(m, count, points);
+  return TransformIntegers<ShortTraits>(m, count, points);
 }
 
 int32_t M_TransformFixPoints(const M_Matrix3* m, int32_t count, M_FixedPoint* points) {
-  return IntegerPoints<FixedTraits>::Transform(m, count, points);
+  return TransformIntegers<FixedTraits>(m, count, points);
 }
 
 int32_t M_TransformVector3(const M_Matrix3* m, int32_t count, M_Vector3T<double>* vectors) {
-  return TransformAll<Vectors3>(m, count, vectors);
+  TransformBatch<Vectors3>(m, count, vectors);
+  return 0;
 }
 
 int32_t M_TransformVector4NoDivide(const M_Matrix4* m, int32_t count, M_Vector4T<double>* vectors) {
-  return TransformAll<Vectors4>(m, count, vectors);
+  TransformBatch<Vectors4>(m, count, vectors);
+  return 0;
 }
 
 int32_t M_TransformVector4(const M_Matrix4* m, int32_t count, M_Vector4T<double>* vectors) {
-  return TransformAll<Points4>(m, count, vectors);
+  TransformBatch<Points4>(m, count, vectors);
+  return 0;
 }
 
 int32_t M_Transform3DFloatPoints(const M_Matrix4* m, int32_t count, M_Vector3T<double>* points) {
-  return TransformAll<Points3>(m, count, points);
+  TransformBatch<Points3>(m, count, points);
+  return 0;
 }
 
 int32_t M_3DTransform2DPoints(const M_Matrix4* m, int32_t count, M_Point* points) {

@@ -10,12 +10,11 @@
 
 namespace Mp {
 
-/// A vector of doubles and its companions of as many lanes.
+/// A vector of doubles, and one of their bits. A comparison gives all bits or none.
 template <int kLanes>
 struct Lanes {
   typedef double Doubles __attribute__((vector_size(kLanes * sizeof(double))));
-  typedef int64_t Mask __attribute__((vector_size(kLanes * sizeof(int64_t))));
-  typedef int32_t Ints __attribute__((vector_size(kLanes * sizeof(int32_t))));
+  typedef uint64_t Bits __attribute__((vector_size(kLanes * sizeof(uint64_t))));
 };
 
 template <class Vector>
@@ -32,9 +31,9 @@ template <class Vector>
 
 /// Whether a comparison holds in every lane.
 template <int kLanes>
-[[gnu::always_inline]] inline bool HoldsInAll(const typename Lanes<kLanes>::Mask& mask) {
-  int64_t all = mask[0];
-  for (int i = 1; i < kLanes; ++i) all &= mask[i];
+[[gnu::always_inline]] inline bool HoldsInAll(const typename Lanes<kLanes>::Bits& comparison) {
+  uint64_t all = comparison[0];
+  for (int i = 1; i < kLanes; ++i) all &= comparison[i];
   return all != 0;
 }
 
