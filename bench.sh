@@ -1,12 +1,14 @@
 #!/bin/sh
 # Installs the libraries that the benchmarks compare with, builds, and prints the comparisons: the
 # fastest of several repetitions of each line, and ours divided by the best peer's.
-# Arguments go to the benchmark program, such as --benchmark_filter=add.
+# Arguments go to the benchmark programs, such as --benchmark_filter=add.
 set -eu
 cd "$(dirname "$0")"
 . scripts/common.sh
 
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libbenchmark-dev pkg-config \
-  libboost-dev libavutil-dev
-build_preset release --target scalar_bench
-build/release/bin/scalar_bench "$@"
+  libboost-dev libavutil-dev libimath-dev libglm-dev libeigen3-dev
+build_preset release
+for program in scalar_bench space_bench; do
+  build/release/bin/$program "$@"
+done

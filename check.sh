@@ -1,6 +1,7 @@
 #!/bin/sh
 # Installs what is missing, builds, and runs every test.
-# --all: also with clang++ and clang-tidy, with the sanitizers, as a static library and unoptimised.
+# --all: also with clang++ and clang-tidy, with the sanitizers, as a static library with baseline vectors
+# only, and unoptimised.
 set -eu
 cd "$(dirname "$0")"
 . scripts/common.sh

@@ -13,8 +13,8 @@
 ///                 M_TranslateMatrix4 M_ScaleMatrix4 M_Matrix3ToMatrix4 M_Matrix3ToMatrix4Uniform
 ///
 /// Conventions: points are row vectors on the left, p' = p x M, so translation is in the last row,
-/// the homogeneous column is the last, and in a product A x B the transform A acts first. Sums and
-/// products are evaluated from the left and never fused. A value strictly between -1e-12 and 1e-12
+/// the homogeneous column is the last, and in a product A x B the transform A acts first. Products
+/// and sums are never fused. A value strictly between -1e-12 and 1e-12
 /// counts as a zero length or w. A function that can fail returns a 32-bit code, 0 for success, or,
 /// as a member, throws it as an `int`. Pointers must not be null unless their comment says so; an
 /// output may be one of the inputs of its type. Everything may be called from any thread.

@@ -4,14 +4,12 @@
 /// Contents
 ///   Points                  M_SetPt M_CopyPt M_EqualPt M_AddPt M_DeltaPoint
 ///   Rectangles              M_SetRect M_SetWHRect M_CopyRect M_CopyWHRect M_EqualRect
-///   M_EqualWHRect
-///                           M_EmptyRect M_InsetRect M_OffsetRect M_CenterRect M_TopLeft
-///                           M_BottomRight
+///                           M_EqualWHRect M_EmptyRect M_InsetRect M_OffsetRect M_CenterRect
+///                           M_TopLeft M_BottomRight
 ///   Points and rectangles   M_PtInRect M_Pt2Rect M_PtToAngle
 ///   Intersection and union  M_SectRect M_UnionRect M_RectCompare
 ///   Conversion              M_FixedRect2Rect M_FixedRect2RectIn M_FixedRect2RectOut
-///   M_Rect2FixedRect
-///                           M_LRect2Rect
+///                           M_Rect2FixedRect M_LRect2Rect
 ///   Transformed points      M_TransformFloatPoints M_TransformPoints M_TransformFixPoints
 ///                           M_TransformVector3 M_TransformVector4NoDivide M_TransformVector4
 ///                           M_Transform3DFloatPoints M_3DTransform2DPoints
@@ -278,8 +276,8 @@ int32_t M_LRect2Rect(const M_LRect* from, M_Rect* to);
 // Transformed points and vectors, in place. Row vectors, translation in the last row. A count
 // below 1 does nothing. The matrix must not lie among the points.
 //
-// The same bits come out whether points are given one by one or many at once, and on every
-// processor. (Which of several NaNs a sum returns is the processor's choice.)
+// The same bits come out whether points are given one by one or many at once, NaNs included, and on
+// every processor, where only the sign of a NaN may be another.
 // ---------------------------------------------------------------------------------------------
 
 /// (x, y) := (m00 x + m10 y + m20, m01 x + m11 y + m21). The third column is not used. Always 0.

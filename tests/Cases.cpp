@@ -1,5 +1,6 @@
 #include "Cases.h"
 
+#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <map>
@@ -30,7 +31,9 @@ std::string Normal(const std::string& expected) {
 class CasesTest : public HostTest, public ::testing::WithParamInterface<const char*> {};
 INSTANTIATE_TEST_SUITE_P(, CasesTest,
                          ::testing::Values("approximation", "bits", "clip", "fixed", "life",
-                                           "ratio", "report", "rounding", "tables"),
+                                           "matrix3", "matrix4", "members", "points", "ratio",
+                                           "rectangles", "report", "rounding", "tables",
+                                           "transforms"),
                          [](const auto& file) { return std::string(file.param); });
 
 TEST_P(CasesTest, GiveTheirResults) {
@@ -83,11 +86,26 @@ std::string Outcome(int32_t code) {
   return text.str();
 }
 
+double ToDouble(const std::string& text) {
+  const bool isLimit = text == "min" || text == "max";
+  return isLimit ? static_cast<double>(ToInteger(text)) : std::strtod(text.c_str(), nullptr);
+}
+
+Arguments::Arguments(const std::string& line) {
+  std::istringstream words(line);
+  for (std::string word; words >> word;) words_.push_back(word);
+}
+
 std::string Arguments::Word() {
-  std::string word;
-  words_ >> word;
-  EXPECT_NE(word, "") << "an argument is missing";
-  return word.empty() ? "0" : word;
+  EXPECT_FALSE(IsEmpty()) << "an argument is missing";
+  return IsEmpty() ? "0" : words_[next_++];
+}
+
+std::vector<double> Arguments::Doubles() {
+  std::istringstream list(Word());
+  std::vector<double> all;
+  for (std::string element; std::getline(list, element, ',');) all.push_back(ToDouble(element));
+  return all;
 }
 
 std::string Aliased(const std::vector<M_Ratio>& operands,

@@ -6,7 +6,6 @@
 #define TESTS_CASES_H
 
 #include <cstdint>
-#include <cstdlib>
 #include <functional>
 #include <sstream>
 #include <string>
@@ -18,6 +17,8 @@
 /// A number in decimal, 0x or "min" and "max" for the ends of 32 bits.
 int64_t ToInteger(const std::string& text);
 M_Ratio ToRatio(const std::string& text);
+/// As strtod, or "min" and "max".
+double ToDouble(const std::string& text);
 
 inline std::string ToText(const std::string& text) { return text; }
 inline std::string ToText(int64_t value) { return std::to_string(value); }
@@ -37,15 +38,19 @@ std::string Outcome(int32_t code);
 /// The arguments of a line, taken one by one.
 class Arguments {
  public:
-  explicit Arguments(const std::string& line) : words_(line) {}
+  explicit Arguments(const std::string& line);
+  bool IsEmpty() const { return next_ == words_.size(); }
   std::string Word();
   int32_t Int() { return static_cast<int32_t>(ToInteger(Word())); }
   uint32_t Unsigned() { return static_cast<uint32_t>(Int()); }
-  double Double() { return std::strtod(Word().c_str(), nullptr); }
+  double Double() { return ToDouble(Word()); }
   M_Ratio Ratio() { return ToRatio(Word()); }
+  /// A list with commas.
+  std::vector<double> Doubles();
 
  private:
-  std::istringstream words_;
+  std::vector<std::string> words_;
+  size_t next_ = 0;
 };
 
 /// Runs a call with an output of its own and with the output in each operand; all must give the

@@ -1,7 +1,7 @@
 // The functions on 3x3 and 4x4 matrices.
 
+#include <algorithm>
 #include <cmath>
-#include <utility>
 
 #include "M_Matrix.h"
 #include "Mp_Err.h"
@@ -119,20 +119,6 @@ bool M_EqualMatrixWithinEpsilon(const M_Matrix4& a, const M_Matrix4& b, double e
   return Mp::IsEqualWithin(a, b, eps);
 }
 
-int32_t M_GetMatrix3DeterminantPlus(const M_Matrix4* m, double* det, M_Matrix4* minors) {
-  const auto& a = m->m;
-  double first[4];
-  MinorsOfRow(a[1], a[2], a[3], first);
-  *det = a[0][0] * first[0] - a[0][1] * first[1] + a[0][2] * first[2] - a[0][3] * first[3];
-  if (minors) {
-    std::copy(first, first + 4, minors->m[0]);
-    MinorsOfRow(a[0], a[2], a[3], minors->m[1]);
-    MinorsOfRow(a[0], a[1], a[3], minors->m[2]);
-    MinorsOfRow(a[0], a[1], a[2], minors->m[3]);
-  }
-  return 0;
-}
-
 extern "C" {
 
 // ---------------------------------------------------------------------------------------------
@@ -238,6 +224,20 @@ int32_t M_TransposeMatrix4(const M_Matrix4* src, M_Matrix4* dst) {
            {a[0][1], a[1][1], a[2][1], a[3][1]},
            {a[0][2], a[1][2], a[2][2], a[3][2]},
            {a[0][3], a[1][3], a[2][3], a[3][3]}}};
+  return 0;
+}
+
+int32_t M_GetMatrix3DeterminantPlus(const M_Matrix4* m, double* det, M_Matrix4* minors) {
+  const auto& a = m->m;
+  double first[4];
+  MinorsOfRow(a[1], a[2], a[3], first);
+  *det = a[0][0] * first[0] - a[0][1] * first[1] + a[0][2] * first[2] - a[0][3] * first[3];
+  if (minors) {
+    std::copy(first, first + 4, minors->m[0]);
+    MinorsOfRow(a[0], a[2], a[3], minors->m[1]);
+    MinorsOfRow(a[0], a[1], a[3], minors->m[2]);
+    MinorsOfRow(a[0], a[1], a[2], minors->m[3]);
+  }
   return 0;
 }
 

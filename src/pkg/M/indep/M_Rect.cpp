@@ -5,7 +5,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <type_traits>
 
 #include "Mp_Arith.h"
 #include "Mp_Rect.h"

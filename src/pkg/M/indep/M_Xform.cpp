@@ -138,7 +138,7 @@ class Vectors4 {
   [[gnu::always_inline]] explicit Vectors4(const M_Matrix4& m) {
     for (int i = 0; i < 4; ++i) {
       for (int part = 0; part < kParts; ++part) {
-        rows_[i][part] = Mp::Load<V>(&m.m[i][part * kLanes]);
+        rows_[i][part] = Mp::Load<V>(&m.m[i][part == 0 ? 0 : 2]);
       }
     }
   }
@@ -148,10 +148,15 @@ class Vectors4 {
            p.w * rows_[3][part];
   }
 
+  [[gnu::always_inline]] static void StorePart(M_Vector4T<double>* vector, int part,
+                                               const V& value) {
+    Mp::Store(part == 0 ? &vector->x : &vector->z, value);
+  }
+
   [[gnu::always_inline]] void Transform(M_Vector4T<double>* vector) const {
     const M_Vector4T<double> p = *vector;
     for (int part = 0; part < kParts; ++part) {
-      Mp::Store(&vector->x + part * kLanes, Part(p, part));
+      StorePart(vector, part, Part(p, part));
     }
   }
 
@@ -159,40 +164,29 @@ class Vectors4 {
   V rows_[4][kParts];
 };
 
-// (x, y, z, w) x m, divided by w. The divisions of a block are one division of a vector.
+// (x, y, z, w) x m, divided by w.
 template <int kLanes>
 class Points4 {
  public:
   static constexpr int kBlock = kLanes;
 
-  [[gnu::always_inline]] explicit Points4(const M_Matrix4& m) : vectors_(m) {}
+  explicit Points4(const M_Matrix4& m) : m_(m) {}
 
   [[gnu::always_inline]] void Transform(M_Vector4T<double>* points) const {
-    constexpr int kLast = Vectors4<kLanes>::kParts - 1;
-    V p[kLanes][kLast + 1];
-    for (int i = 0; i < kLanes; ++i) {
-      for (int part = 0; part <= kLast; ++part) p[i][part] = vectors_.Part(points[i], part);
-    }
-    V w;
-    if constexpr (kLanes == 2) {
-      w = __builtin_shufflevector(p[0][kLast], p[1][kLast], 1, 3);
-    } else {
-      const V zw01 = __builtin_shufflevector(p[0][kLast], p[1][kLast], 1, 5, 3, 7);
-      const V zw23 = __builtin_shufflevector(p[2][kLast], p[3][kLast], 1, 5, 3, 7);
-      w = __builtin_shufflevector(zw01, zw23, 2, 3, 6, 7);
-    }
-    const Divisor<kLanes> divisor(w);
-    for (int i = 0; i < kLanes; ++i) {
-      for (int part = 0; part <= kLast; ++part) {
-        Mp::Store(&points[i].x + part * kLanes, p[i][part] * divisor.factor[i]);
-      }
-      points[i].w = divisor.w[i];
-    }
+    const auto& a = m_.m;
+    const auto p = Mp::Quadruples<kLanes>::Load(points);
+    const auto column = [&](int j) __attribute__((always_inline)) {
+      return p.x * a[0][j] + p.y * a[1][j] + p.z * a[2][j] + p.w * a[3][j];
+    };
+    const Divisor<kLanes> divisor(column(3));
+    const Mp::Quadruples<kLanes> transformed = {column(0) * divisor.factor,
+                                                column(1) * divisor.factor,
+                                                column(2) * divisor.factor, divisor.w};
+    transformed.Store(points);
   }
 
  private:
-  using V = Doubles<kLanes>;
-  Vectors4<kLanes> vectors_;
+  const M_Matrix4& m_;
 };
 
 // ---------------------------------------------------------------------------------------------
@@ -303,14 +297,16 @@ static_assert(FixedTraits::kHighest + 0.5 == -(FixedTraits::kLowest + 0.5));
 template <template <int> class Kernel, class Matrix, class Point>
 void TransformBatch(const Matrix* m, int32_t count, Point* points);
 
-// What is left over fills a block of its own and goes through the same instructions. That leaves no
-// room even for the sign of a NaN, which is that of one operand of a sum or the other, as the
-// compiler has placed them.
+// What is left over fills a block of its own and goes through the same instructions as the others.
+// That leaves no room even for the sign of a NaN, which is that of one operand of a sum or the
+// other, as the compiler has placed them.
 template <template <int> class Kernel, int kBlock, class Matrix, class Point>
 [[gnu::noinline]] void TransformLeft(const Matrix* m, int32_t count, Point* points) {
   Point block[kBlock] = {};
   std::copy_n(points, count, block);
-  TransformBatch<Kernel>(m, kBlock, block);
+  // A constant would be a reason to compile the kernel once more for this call.
+  const volatile int32_t size = kBlock;
+  TransformBatch<Kernel>(m, size, block);
   std::copy_n(block, count, points);
 }
 
@@ -319,11 +315,10 @@ template <template <int> class Kernel, int kBlock, class Matrix, class Point>
 constexpr int32_t kWorthAligning = 256;
 
 // How many points, fewer than a block, lie before the first aligned one; 0 if none is aligned.
-template <int kAlignment, int kBlock, class Point>
+template <size_t kAlignment, int kBlock, class Point>
 int32_t PointsBeforeAligned(const Point* points) {
-  const auto address = reinterpret_cast<uintptr_t>(points);
   for (int32_t i = 1; i < kBlock; ++i) {
-    if ((address + i * sizeof(Point)) % kAlignment == 0) return i;
+    if (reinterpret_cast<uintptr_t>(points + i) % kAlignment == 0) return i;
   }
   return 0;
 }
@@ -340,10 +335,19 @@ template <template <int> class Kernel, int kLanes, class Matrix, class Point>
     }
   }
   const Kernel<kLanes> kernel(*m);
+  // Not unrolled: the copies need not place their operands alike.
+#ifdef __clang__
+#pragma clang loop unroll(disable)
+#endif
   for (; count >= kBlock; count -= kBlock, points += kBlock) kernel.Transform(points);
   if constexpr (kBlock > 1) {
     if (count > 0) TransformLeft<Kernel, kBlock>(m, count, points);
   }
+}
+
+template <template <int> class Kernel, class Matrix, class Point>
+[[gnu::noinline]] void TransformWithBaseline(const Matrix* m, int32_t count, Point* points) {
+  TransformInLanes<Kernel, 2>(m, count, points);
 }
 
 // Whole blocks until one fails; returns the number of points that are done.
@@ -389,7 +393,7 @@ int32_t TransformWhileInsideWithAvx2(const M_Matrix3*, int32_t, typename Traits:
 template <template <int> class Kernel, class Matrix, class Point>
 void TransformBatch(const Matrix* m, int32_t count, Point* points) {
   if (HasAvx2()) return TransformWithAvx2<Kernel>(m, count, points);
-  TransformInLanes<Kernel, 2>(m, count, points);
+  TransformWithBaseline<Kernel>(m, count, points);
 }
 
 // A coordinate of one point. False, with nothing stored, for one that is out of bounds: the upper
@@ -523,14 +527,17 @@ int32_t M_3DTransform2DPoints(const M_Matrix4* m, int32_t count, M_Point* points
   };
   constexpr int32_t kChunk = 64;
   M_Vector3T<double> chunk[kChunk];
-  for (int32_t start = 0; start < count; start += kChunk) {
-    const int32_t size = std::min(count - start, kChunk);
-    M_Point* const some = points + start;
+  while (count > 0) {
+    const int32_t size = std::min(count, kChunk);
     for (int32_t i = 0; i < size; ++i) {
-      chunk[i] = {static_cast<double>(some[i].h), static_cast<double>(some[i].v), 0.0};
+      chunk[i] = {static_cast<double>(points[i].h), static_cast<double>(points[i].v), 0.0};
     }
     M_Transform3DFloatPoints(m, size, chunk);
-    for (int32_t i = 0; i < size; ++i) M_SetPt(&some[i], toShort(chunk[i].x), toShort(chunk[i].y));
+    for (int32_t i = 0; i < size; ++i) {
+      M_SetPt(&points[i], toShort(chunk[i].x), toShort(chunk[i].y));
+    }
+    points += size;
+    count -= size;
   }
   return 0;
 }

@@ -10,7 +10,7 @@
 
 /// The determinant of m and, unless `minors` is null, all minors: element (i, j) is the determinant
 /// of m without row i and column j, with no sign. Always 0. Not exported.
-int32_t M_GetMatrix3DeterminantPlus(const M_Matrix4* m, double* det, M_Matrix4* minors);
+extern "C" int32_t M_GetMatrix3DeterminantPlus(const M_Matrix4* m, double* det, M_Matrix4* minors);
 
 namespace Mp {
 
