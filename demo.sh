@@ -1,5 +1,5 @@
 #!/bin/sh
-# Installs what is missing, builds, and prints the time sheets of the sample compositions.
+# Installs what is missing, builds, and prints the sheets of the sample compositions.
 set -eu
 cd "$(dirname "$0")"
 . scripts/common.sh
@@ -8,4 +8,4 @@ need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libb
 build_preset release --target comp catalogues
 echo
 build/release/bin/comp examples/comp/samples/film.json examples/comp/samples/broadcast.json \
-  examples/comp/samples/sound.json
+  examples/comp/samples/sound.json examples/comp/samples/stage.json

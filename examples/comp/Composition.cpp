@@ -72,7 +72,36 @@ class Fields {
     return {{*num, static_cast<uint32_t>(*den)}, {}};
   }
 
+  double Number(const char* field) const { return ToNumber(field, Get(field)); }
+
+  M_Vector2T<double> Pair(const char* field) const {
+    const Json& list = List(field);
+    return {ToNumber(field, list[0]), ToNumber(field, list[1])};
+  }
+
+  Size Pixels(const char* field) const {
+    const auto length = [&](const Json& value) {
+      constexpr int32_t kMost = 30000;
+      const bool isLength = value.is_number_integer() && value > 0 && value <= kMost;
+      if (!isLength) ComplainAbout(field, value.dump() + " is not a whole number from 1 to 30000");
+      return value.get<int32_t>();
+    };
+    const Json& list = List(field);
+    return {length(list[0]), length(list[1])};
+  }
+
  private:
+  const Json& List(const char* field) const {
+    const Json& list = Get(field);
+    if (!list.is_array() || list.size() != 2) ComplainAbout(field, "is not a list of two numbers");
+    return list;
+  }
+
+  double ToNumber(const char* field, const Json& value) const {
+    if (!value.is_number()) ComplainAbout(field, value.dump() + " is not a number");
+    return value;
+  }
+
   template <class T>
   static std::optional<T> Parse(const std::string& text) {
     T value;
@@ -105,12 +134,34 @@ class Fields {
   std::string place_;
 };
 
-Layer ReadLayer(const Json& json, const std::string& fileName, size_t number) {
+M_Vector2T<double> Center(const Size& size) { return {size.width / 2.0, size.height / 2.0}; }
+
+std::optional<Placement> ReadPlacement(const Fields& fields, const std::optional<Size>& frame) {
+  if (!fields.Has("size")) {
+    for (const char* field : {"anchor", "position", "scale", "rotation"}) {
+      if (fields.Has(field)) fields.ComplainAbout(field, "places a layer that has no \"size\"");
+    }
+    return {};
+  }
+  if (!frame) fields.ComplainAbout("size", "needs a composition that has a \"size\"");
+  Placement placement;
+  placement.size = fields.Pixels("size");
+  placement.anchor = fields.Has("anchor") ? fields.Pair("anchor") : Center(placement.size);
+  placement.position = fields.Has("position") ? fields.Pair("position") : Center(*frame);
+  placement.scale = fields.Has("scale") ? fields.Pair("scale") : M_Vector2T<double>{1, 1};
+  placement.rotation = fields.Has("rotation") ? fields.Number("rotation") : 0;
+  return placement;
+}
+
+Layer ReadLayer(const Json& json, const std::string& fileName, size_t number,
+                const std::optional<Size>& frame) {
   std::string place = fileName + ": layer " + std::to_string(number);
   if (json.contains("name") && json["name"].is_string()) {
     place += " (\"" + json["name"].get<std::string>() + "\")";
   }
-  const Fields fields(json, place, {"name", "sourceRate", "timeBase", "in", "out", "stretch"});
+  const Fields fields(json, place,
+                      {"name", "sourceRate", "timeBase", "in", "out", "stretch", "size", "anchor",
+                       "position", "scale", "rotation"});
   Layer layer;
   layer.name = fields.Name();
   layer.hasSourceRate = fields.Has("sourceRate");
@@ -126,6 +177,7 @@ Layer ReadLayer(const Json& json, const std::string& fileName, size_t number) {
     fields.ComplainAbout("out", "lies more than 32 bits behind \"in\"");
   }
   layer.stretch = fields.Has("stretch") ? fields.Ratio("stretch", false) : GivenRatio{{1, 1}, {}};
+  layer.placement = ReadPlacement(fields, frame);
   return layer;
 }
 
@@ -158,17 +210,19 @@ Composition ReadComposition(std::istream& in, const std::string& fileName) {
     complain("a number is too large");
   }
   const Fields fields(json, fileName + ": composition",
-                      {"name", "frameRate", "start", "duration", "layers"});
+                      {"name", "frameRate", "start", "duration", "size", "layers"});
   Composition composition;
   composition.name = fields.Name();
   composition.frameRate = fields.Ratio("frameRate", true);
   composition.start = fields.Whole("start");
   composition.duration = fields.Whole("duration");
   if (composition.duration <= 0) fields.ComplainAbout("duration", "is not greater than zero");
+  if (fields.Has("size")) composition.size = fields.Pixels("size");
   const Json& layers = fields.Get("layers");
   if (!layers.is_array()) fields.ComplainAbout("layers", "is not a list");
   for (const Json& layer : layers) {
-    composition.layers.push_back(ReadLayer(layer, fileName, composition.layers.size() + 1));
+    composition.layers.push_back(
+        ReadLayer(layer, fileName, composition.layers.size() + 1, composition.size));
   }
   return composition;
 }

@@ -5,10 +5,12 @@
 
 #include <cstdint>
 #include <iosfwd>
+#include <optional>
 #include <stdexcept>
 #include <string>
 #include <vector>
 
+#include "M_Matrix.h"
 #include "M_Utils.h"
 
 namespace comp {
@@ -25,13 +27,29 @@ struct GivenRatio {
   std::string given;
 };
 
+/// Whole pixels.
+struct Size {
+  int32_t width;
+  int32_t height;
+};
+
+/// How a layer is placed in the frame. Pixels, to the right and downwards.
+struct Placement {
+  Size size;
+  M_Vector2T<double> anchor;    ///< In the layer: the point that is placed.
+  M_Vector2T<double> position;  ///< In the frame: where it is placed.
+  M_Vector2T<double> scale;
+  double rotation;  ///< Degrees, clockwise.
+};
+
 struct Layer {
   std::string name;
-  bool hasSourceRate;   ///< The time base is the frames of a source rate.
-  GivenRatio timeBase;  ///< Seconds a unit, or with a source rate units a second.
-  int32_t in;           ///< First unit.
-  int32_t out;          ///< The unit behind the last.
-  GivenRatio stretch;   ///< Seconds on screen a second of the source.
+  bool hasSourceRate;                  ///< The time base is the frames of a source rate.
+  GivenRatio timeBase;                 ///< Seconds a unit, or with a source rate units a second.
+  int32_t in;                          ///< First unit.
+  int32_t out;                         ///< The unit behind the last.
+  GivenRatio stretch;                  ///< Seconds on screen a second of the source.
+  std::optional<Placement> placement;  ///< None for what is not seen.
 };
 
 struct Composition {
@@ -39,6 +57,7 @@ struct Composition {
   GivenRatio frameRate;  ///< Frames a second.
   int32_t start;         ///< First frame.
   int32_t duration;      ///< Frames.
+  std::optional<Size> size;
   std::vector<Layer> layers;
 };
 

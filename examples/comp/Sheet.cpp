@@ -43,8 +43,13 @@ class SheetMaker {
   }
 
   Sheet Make(ReportCollector& collector) const {
-    Sheet sheet = {
-        composition_.name, composition_.frameRate, InFrames(start_), InFrames(duration_), {}, {}};
+    Sheet sheet = {composition_.name,
+                   composition_.frameRate,
+                   InFrames(start_),
+                   InFrames(duration_),
+                   {},
+                   {},
+                   {}};
     Value sum = {{0, 1}, Accuracy::kExact};
     for (const Layer& layer : composition_.layers) {
       collector.SetLayer(layer.name);
@@ -53,6 +58,7 @@ class SheetMaker {
       row.runningSum = sum;
       sheet.rows.push_back(std::move(row));
     }
+    sheet.layout = MakeLayout(composition_, collector);
     sheet.reports = collector.Reports();
     return sheet;
   }

@@ -1,12 +1,14 @@
 /// \file
-/// The time sheet of a composition: where each layer lies, exactly and in frames.
+/// The sheet of a composition: where each layer lies in time, exactly and in frames, and in space.
 #ifndef COMP_SHEET_H
 #define COMP_SHEET_H
 
+#include <optional>
 #include <string>
 #include <vector>
 
 #include "Composition.h"
+#include "Layout.h"
 #include "M_Utils.h"
 #include "Reports.h"
 
@@ -54,6 +56,7 @@ struct Sheet {
   GivenRatio frameRate;
   Time start, duration;
   std::vector<Row> rows;
+  std::optional<Layout> layout;
   std::vector<Report> reports;  ///< What the library reported on the way.
 };
 

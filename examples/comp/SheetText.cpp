@@ -3,6 +3,8 @@
 #include <cstdio>
 #include <nlohmann/json.hpp>
 
+#include "LayoutText.h"
+
 namespace comp {
 namespace {
 
@@ -113,6 +115,7 @@ std::string ToTable(const Sheet& sheet) {
   if (sum.accuracy != Accuracy::kOverflow) text.append(" s, ").append(Name(sum.accuracy));
   text += '\n';
   text += "~ marks what is not exact: frames are rounded, ratios the nearest that fit.\n";
+  if (sheet.layout) text.append("\n").append(ToTable(*sheet.layout));
   if (!sheet.reports.empty()) text += "\nReported by the library:\n";
   for (const Report& report : sheet.reports) {
     text.append("  [").append(IdText(report.id)).append("] ").append(report.text);
@@ -141,6 +144,7 @@ std::string ToJson(const Sheet& sheet) {
                               {"sourceDuration", ToJson(row.sourceDuration)},
                               {"runningSum", ToJson(row.runningSum)}});
   }
+  if (sheet.layout) json["layout"] = ToJson(*sheet.layout);
   for (const Report& report : sheet.reports) {
     json["reports"].push_back({{"layer", report.layer},
                                {"id", IdText(report.id)},

@@ -1,5 +1,5 @@
 /// \file
-/// A time sheet in writing.
+/// A sheet in writing.
 #ifndef COMP_SHEET_TEXT_H
 #define COMP_SHEET_TEXT_H
 

@@ -1,4 +1,4 @@
-// comp: prints the time sheet of a composition file.
+// comp: prints the sheet of a composition file.
 
 #include <clocale>
 #include <cstdlib>
@@ -18,10 +18,12 @@ constexpr int kBadInput = 2;
 
 constexpr char kHelp[] = R"(Usage: comp [--json] FILE...
 
-Prints the time sheet of each composition file: its frame rate, start and
-duration, and for every layer its in and out points as exact ratios in seconds
-and as frames, also clipped to the composition, its stretch and the running sum
-of the durations.
+Prints the sheet of each composition file: its frame rate, start and duration,
+and for every layer its in and out points as exact ratios in seconds and as
+frames, also clipped to the composition, its stretch and the running sum of the
+durations. For a composition with a size also where its layers lie: what kind of
+matrix places each of them, its corners, the pixels it touches, those in the
+frame and those above each layer below it.
 
   --json  prints the sheet as JSON
   --help  prints this text
@@ -32,16 +34,23 @@ A composition file is a JSON object:
              which is approximated
   start      first frame
   duration   number of frames
-  layers     list of layers:
+  size       width and height of the frame in pixels, [1920, 1080]; may be left
+             out, and so may all that follows from it
+  layers     list of layers, the topmost first:
     name        text
     timeBase    seconds a unit, such as "1/600" or "1/48000", or instead
     sourceRate  frames a second, as frameRate
     in, out     first unit, and the unit behind the last
     stretch     seconds on screen a second of the source; 1 if left out
+    size        width and height in pixels; left out for what is not seen
+    anchor      the point of the layer that is placed; its centre if left out
+    position    where in the frame; the centre if left out
+    scale       about the anchor, [1, 1] if left out
+    rotation    about the anchor, in degrees, clockwise; 0 if left out
 
 Exit status: 0 if every sheet was printed, 1 if the output cannot be written, 2
-if an argument or a file cannot be used. The library's own reports are part of the sheet, in the language of the
-environment.
+if an argument or a file cannot be used. The library's own reports are part of
+the sheet, in the language of the environment.
 )";
 
 comp::Composition ReadFile(const std::string& fileName) {

@@ -1,0 +1,60 @@
+#include "Layout.h"
+
+namespace comp {
+namespace {
+
+M_LRect ToRect(const Size& size) { return {0, 0, size.width, size.height}; }
+
+// The layer's anchor comes to lie at its position; about it the layer is scaled, then rotated.
+M_Matrix3 MakeMatrix(const Placement& placement) {
+  M_Matrix3 m;
+  M_SetIdentityMatrix(&m);
+  M_TranslateMatrix(&m, -placement.anchor.x, -placement.anchor.y);
+  M_ScaleMatrix(&m, placement.scale.x, placement.scale.y, 0, 0);
+  M_RotateMatrix(&m, placement.rotation, 0, 0);
+  M_TranslateMatrix(&m, placement.position.x, placement.position.y);
+  return m;
+}
+
+PlacedLayer Place(const Layer& layer, const Size& frame) {
+  PlacedLayer placed = {};
+  placed.name = layer.name;
+  placed.size = layer.placement->size;
+  const M_Matrix3 m = MakeMatrix(*layer.placement);
+  M_GetMatrixType(&m, &placed.matrixType);
+  // Asked in space: the inversion in the plane takes a last pivot of 0 for no failure.
+  M_Matrix4 inverse;
+  M_Matrix3ToMatrix4(&m, &inverse);
+  placed.isInvertible = M_InverseMatrix4(&inverse, &inverse) == 0;
+  const M_LRect own = ToRect(placed.size);
+  M_FloatRect rect = {0, 0, static_cast<double>(own.right), static_cast<double>(own.bottom)};
+  M_TransformFloatRect(&m, &rect, placed.corners.data(), nullptr);
+  placed.bounds = M_TransformBounds(m, own);
+  const M_LRect whole = ToRect(frame);
+  M_SectLRect(&placed.bounds, &whole, &placed.inFrame);
+  return placed;
+}
+
+}  // namespace
+
+std::optional<Layout> MakeLayout(const Composition& composition, ReportCollector& collector) {
+  if (!composition.size) return {};
+  Layout layout = {*composition.size, {}, {}};
+  for (const Layer& layer : composition.layers) {
+    if (!layer.placement) continue;
+    collector.SetLayer(layer.name);
+    layout.layers.push_back(Place(layer, layout.frame));
+  }
+  for (auto layer = layout.layers.begin(); layer != layout.layers.end(); ++layer) {
+    for (auto below = layer + 1; below != layout.layers.end(); ++below) {
+      M_LRect common;
+      if (M_SectLRect(&layer->bounds, &below->bounds, &common)) {
+        layer->overlaps.push_back({below->name, common});
+      }
+    }
+    M_UnionLRect(&layout.all, &layer->bounds, &layout.all);
+  }
+  return layout;
+}
+
+}  // namespace comp

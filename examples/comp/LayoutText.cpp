@@ -1,0 +1,100 @@
+#include "LayoutText.h"
+
+#include <cmath>
+#include <cstdio>
+#include <nlohmann/json.hpp>
+
+namespace comp {
+namespace {
+
+using Json = nlohmann::ordered_json;
+
+const char* Name(uint32_t matrixType) {
+  switch (matrixType) {
+    case M_MATRIX_IDENTITY:
+      return "identity";
+    case M_MATRIX_TRANSLATE:
+      return "translation";
+    case M_MATRIX_SCALE:
+      return "scale";
+    case M_MATRIX_SCALE_TRANSLATE:
+      return "scale and translation";
+    case M_MATRIX_AFFINE:
+      return "rotation or skew";
+    default:
+      return "perspective";
+  }
+}
+
+// To a thousandth of a pixel, and without a sign for what is 0 then.
+std::string ToText(double coordinate) {
+  char text[32];
+  std::snprintf(text, sizeof text, "%.10g", std::round(coordinate * 1000) / 1000 + 0.0);
+  return text;
+}
+
+std::string ToText(const Size& size) {
+  return std::to_string(size.width).append(" x ").append(std::to_string(size.height));
+}
+
+std::string ToText(const M_LRect& r) {
+  if (M_EmptyLRect(&r)) return "nothing";
+  char text[64];
+  std::snprintf(text, sizeof text, "%d,%d to %d,%d", r.left, r.top, r.right, r.bottom);
+  return text;
+}
+
+std::string Line(const std::string& label, const std::string& text) {
+  std::string line = std::string("  ").append(label);
+  line.resize(std::max<size_t>(line.size() + 1, 14), ' ');
+  return line.append(text).append("\n");
+}
+
+Json ToJson(const M_LRect& r) { return {r.left, r.top, r.right, r.bottom}; }
+Json ToJson(const Size& size) { return {size.width, size.height}; }
+
+}  // namespace
+
+std::string ToTable(const Layout& layout) {
+  std::string text = "Frame " + ToText(layout.frame) + ", layers from the top down\n";
+  for (const PlacedLayer& layer : layout.layers) {
+    text += "\nLayer \"" + layer.name + "\", " + ToText(layer.size) + ", placed by " +
+            Name(layer.matrixType) + (layer.isInvertible ? "\n" : ", which cannot be undone\n");
+    std::string corners;
+    for (const auto& corner : layer.corners) {
+      corners.append(corners.empty() ? "(" : " (").append(ToText(corner.x)).append(", ");
+      corners.append(ToText(corner.y)).append(")");
+    }
+    text += Line("corners", corners);
+    text += Line("pixels", ToText(layer.bounds));
+    text += Line("in frame", ToText(layer.inFrame));
+    for (const Overlap& overlap : layer.overlaps) {
+      text += Line("over \"" + overlap.name + "\"", ToText(overlap.rect));
+    }
+  }
+  return text + "\nAll layers: " + ToText(layout.all) + "\n";
+}
+
+nlohmann::ordered_json ToJson(const Layout& layout) {
+  Json json = {
+      {"frame", ToJson(layout.frame)}, {"layers", Json::array()}, {"all", ToJson(layout.all)}};
+  for (const PlacedLayer& layer : layout.layers) {
+    Json corners = Json::array();
+    for (const auto& corner : layer.corners) corners.push_back({corner.x, corner.y});
+    Json overlaps = Json::array();
+    for (const Overlap& overlap : layer.overlaps) {
+      overlaps.push_back({{"name", overlap.name}, {"rect", ToJson(overlap.rect)}});
+    }
+    json["layers"].push_back({{"name", layer.name},
+                              {"size", ToJson(layer.size)},
+                              {"matrix", Name(layer.matrixType)},
+                              {"isInvertible", layer.isInvertible},
+                              {"corners", corners},
+                              {"bounds", ToJson(layer.bounds)},
+                              {"inFrame", ToJson(layer.inFrame)},
+                              {"overlaps", overlaps}});
+  }
+  return json;
+}
+
+}  // namespace comp
