@@ -7,6 +7,7 @@
 #include "Mp_Err.h"
 #include "Mp_Matrix.h"
 #include "Mp_Out.h"
+#include "Mp_Tolerance.h"
 
 namespace {
 
@@ -301,17 +302,12 @@ int32_t M_Matrix3ToMatrix4(const M_Matrix3* m3, M_Matrix4* m4) {
 }
 
 int32_t M_Matrix3ToMatrix4Uniform(const M_Matrix3* m3, M_Matrix4* m4) {
-  // 1.000088900582341e-12: 1e-12 with its low bits cut off.
-  constexpr double kLeastTolerance = 0x1.198p-40;
   M_Matrix3ToMatrix4(m3, m4);
   const auto& a = m3->m;
-  const double column0 = a[0][0] * a[0][0] + a[1][0] * a[1][0];
-  const double column1 = a[0][1] * a[0][1] + a[1][1] * a[1][1];
-  const double longer = column0 > column1 ? column0 : column1;
-  const double shorter = column0 > column1 ? column1 : column0;
-  const double relative = 1e-12 * longer;
-  const double tolerance = relative > kLeastTolerance ? relative : kLeastTolerance;
-  if (longer - shorter < tolerance) m4->m[2][2] = std::sqrt(column0);
+  // The squared lengths of the columns.
+  const double x = a[0][0] * a[0][0] + a[1][0] * a[1][0];
+  const double y = a[0][1] * a[0][1] + a[1][1] * a[1][1];
+  if (Mp::IsNearlyEqual(x, y)) m4->m[2][2] = std::sqrt(x);
   return 0;
 }
 

@@ -1,14 +1,32 @@
 /// \file
-/// What counts as a zero length, determinant or homogeneous w.
+/// What counts as zero, and as equal.
 #ifndef MP_TOLERANCE_H
 #define MP_TOLERANCE_H
 
+#include <algorithm>
+
 namespace Mp {
 
+/// For a length, a divisor or a homogeneous w.
 inline constexpr double kTolerance = 1e-12;
 
 /// Strictly within the tolerance of 0. A NaN is not.
 constexpr bool IsNearZero(double value) { return -kTolerance < value && value < kTolerance; }
+
+/// Whether a and b differ by less than the tolerance relative to the larger (of two negative values,
+/// in magnitude), or by less than about 1e-12. A NaN equals nothing.
+constexpr bool IsNearlyEqual(double a, double b) {
+  // 1e-12 without its low bits: 1.000088900582341e-12.
+  constexpr double kLeast = 0x1.198p-40;
+  double larger = a > b ? a : b;
+  double smaller = a > b ? b : a;
+  if (larger < 0) {
+    const double magnitude = -smaller;
+    smaller = -larger;
+    larger = magnitude;
+  }
+  return larger - smaller < std::max(kLeast, kTolerance * larger);
+}
 
 }  // namespace Mp
 
