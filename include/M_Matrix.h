@@ -1,5 +1,5 @@
 /// \file
-/// M_Matrix.h: vectors, 3x3 and 4x4 matrices, and the functions on them.
+/// M_Matrix.h: vectors, matrices and the functions on them, rotations, planes and lines.
 ///
 /// Contents
 ///   Vectors       M_Vector2T M_Vector3T M_Vector4T
@@ -11,13 +11,21 @@
 ///                 M_TransposeMatrix4 M_GetMatrix4Determinant M_InverseMatrix4Quiet
 ///                 M_InverseMatrix4 M_CalcNormalMatrix4Quiet M_CalcNormalMatrix4
 ///                 M_TranslateMatrix4 M_ScaleMatrix4 M_Matrix3ToMatrix4 M_Matrix3ToMatrix4Uniform
+///   Decomposition M_DecomposeMatrix4 M_DecomposeMatrix4ZYX M_GetOrderedXYZRotationFromMatrix
+///                 M_Correct3DDecompFor2D
+///   Rotations     M_RotateMatrix4 M_RotateMatrix4XYZ M_RotateMatrix4XYZPlus
+///                 M_ConvertAxisAngleToOrderedXYZRotation M_LookAtMatrix
+///   Quaternions   M_QuatToMatrix4 M_Matrix4ToQuat M_Slerp
+///   Planes        M_GetPlaneEquation M_GetPlaneEquation2 M_RayIntersectPlane
+///   Lines         M_PerpDistTo2DLine M_Clip3DLine M_ClipLine2Rect
+///   Directions    M_ComputeDirectionalComponents M_VecToAngle M_Pt2Angle M_TransformPtF
 ///
 /// Conventions: points are row vectors on the left, p' = p x M, so translation is in the last row,
 /// the homogeneous column is the last, and in a product A x B the transform A acts first. Products
-/// and sums are never fused. A value strictly between -1e-12 and 1e-12
-/// counts as a zero length or w. A function that can fail returns a 32-bit code, 0 for success, or,
-/// as a member, throws it as an `int`. Pointers must not be null unless their comment says so; an
-/// output may be one of the inputs of its type. Everything may be called from any thread.
+/// and sums are never fused. A value strictly between -1e-12 and 1e-12 counts as a zero length or
+/// w. A function that can fail returns a 32-bit code, 0 for success, or, as a member, throws it as
+/// an `int`. Pointers must not be null unless their comment says so; an output may be one of the
+/// inputs of its type. Everything may be called from any thread.
 #ifndef M_MATRIX_H
 #define M_MATRIX_H
 
@@ -258,6 +266,173 @@ int32_t M_Matrix3ToMatrix4(const M_Matrix3* m3, M_Matrix4* m4);
 
 /// As M_Matrix3ToMatrix4, but where m3 scales x and y alike z is scaled alike, too. Always 0.
 int32_t M_Matrix3ToMatrix4Uniform(const M_Matrix3* m3, M_Matrix4* m4);
+
+// ---------------------------------------------------------------------------------------------
+// Decomposition
+// ---------------------------------------------------------------------------------------------
+
+/// What was projected away, not divided by any scale.
+struct M_Shear {
+  double xy;  ///< Of row 1 on row 0.
+  double xz;  ///< Of row 2 on row 0.
+  double yz;  ///< Of row 2 on row 1.
+};
+static_assert(sizeof(M_Shear) == 24);
+
+/// A matrix taken apart.
+struct M_Matrix4Decomp {
+  M_Vector3T<double> translate;
+  M_Vector3T<double> scale;  ///< Lengths of the rows without shear; all negative for a mirror.
+  M_Shear shear;
+  M_Vector3T<double> rotate;  ///< Radians.
+};
+static_assert(sizeof(M_Matrix4Decomp) == 96 && offsetof(M_Matrix4Decomp, scale) == 24);
+static_assert(offsetof(M_Matrix4Decomp, shear) == 48 && offsetof(M_Matrix4Decomp, rotate) == 72);
+
+/// *d := m / m[3][3] as L x R x T: L = {{sx, 0, 0}, {xy, sy, 0}, {xz, yz, sz}} of scale and shear
+/// (where the scales are negated for a mirror, L has the shears with the other sign), R = Rz x Ry x
+/// Rx, which M_RotateMatrix4XYZ makes of the angles, and the translation T.
+/// M_ERR_NOT_DECOMPOSABLE, with all of *d zero, when m[3][3] is 0 or the rest of the last column is
+/// not. `failed` may be null: then a failure is reported. Otherwise it is set to 1 by a failure and
+/// left alone by a success. With a zero row there is no failure, but the angles mean little.
+int32_t M_DecomposeMatrix4(const M_Matrix4* m, M_Matrix4Decomp* d, unsigned char* failed);
+
+/// As M_DecomposeMatrix4, but with the angles of R = Rx x Ry x Rz.
+int32_t M_DecomposeMatrix4ZYX(const M_Matrix4* m, M_Matrix4Decomp* d, unsigned char* failed);
+
+/// The angles that M_DecomposeMatrix4 gives, in radians; zeros after a failure, which is reported.
+int32_t M_GetOrderedXYZRotationFromMatrix(const M_Matrix4* m, double* rx, double* ry, double* rz);
+
+/// Turns half turns about x or y, which are flips of a layer in the plane, into negative scales,
+/// and makes the z scale 1. Always 0.
+int32_t M_Correct3DDecompFor2D(M_Matrix4Decomp* d);
+
+// ---------------------------------------------------------------------------------------------
+// Rotations. Angles in radians; a positive one turns x towards y, y towards z and z towards x.
+// ---------------------------------------------------------------------------------------------
+
+/// m := m x R, the rotation about the axis (ax, ay, az), which need not be of unit length. An axis
+/// whose length counts as zero is reported, leaves m untouched and returns 3, which is none of the
+/// error codes.
+int32_t M_RotateMatrix4(M_Matrix4* m, double ax, double ay, double az, double radians);
+
+/// m := m x the rotation about x, then about y and z as they have been turned by then.
+/// M_RotateMatrix4's code if it fails; m is then untouched.
+int32_t M_RotateMatrix4XYZ(M_Matrix4* m, double rx, double ry, double rz);
+
+/// From the identity, as M_RotateMatrix4XYZ. Else about m's own axes, as m has them at each step;
+/// an axis that m takes to zero is left out. A failure's code is returned; m then holds the
+/// rotations made so far.
+int32_t M_RotateMatrix4XYZPlus(bool fromIdentity, M_Matrix4* m, double rx, double ry, double rz);
+
+/// The angles about x, y and z, as M_DecomposeMatrix4 has them, of a rotation about an axis. Fails
+/// as M_RotateMatrix4, with zeros.
+int32_t M_ConvertAxisAngleToOrderedXYZRotation(double ax, double ay, double az, double radians,
+                                               double* rx, double* ry, double* rz);
+
+/// The orientation that looks from eye to target: rows sideways (up x forward), up and forward, and
+/// no translation. With up along the line of sight, the identity turned about x to look up or down;
+/// with eye at target, the identity.
+M_Matrix4 M_LookAtMatrix(const M_Vector3T<double>& eye, const M_Vector3T<double>& target,
+                         const M_Vector3T<double>& up);
+
+// ---------------------------------------------------------------------------------------------
+// Quaternions: four doubles x, y, z, w. All functions return 0. Outputs may be inputs.
+// ---------------------------------------------------------------------------------------------
+
+/// The rotation of a unit quaternion; of another one, scaled by its squared length.
+int32_t M_QuatToMatrix4(const double* q, M_Matrix4* m);
+
+/// The quaternion of a rotation; the last row and column are not looked at.
+int32_t M_Matrix4ToQuat(const M_Matrix4* m, double* q);
+
+/// From q0 (t = 0) to q1 (t = 1) the shorter way round, at a constant speed; along the chord where
+/// they nearly coincide, and q0 where they do.
+int32_t M_Slerp(const double* q0, const double* q1, double* out, double t);
+
+// ---------------------------------------------------------------------------------------------
+// Planes and rays
+// ---------------------------------------------------------------------------------------------
+
+/// The plane a x + b y + c z + d = 0.
+struct M_PlaneEq {
+  double a;
+  double b;
+  double c;
+  double d;
+};
+static_assert(sizeof(M_PlaneEq) == 32 && offsetof(M_PlaneEq, d) == 24);
+
+/// From a point in a direction. The ws are not looked at.
+struct M_Ray {
+  M_Vector4T<double> origin;
+  M_Vector4T<double> direction;
+};
+static_assert(sizeof(M_Ray) == 64 && offsetof(M_Ray, direction) == 32);
+
+/// The plane of a polygon (Newell's method) through the mean of its points, which `centroid`
+/// receives unless it is null. The normal has unit length and points to where the polygon is seen
+/// counter-clockwise; for a polygon without area it is about zero. Of no points the mean and d are
+/// NaNs. Always 0.
+int32_t M_GetPlaneEquation(const M_Vector3T<double>* points, int32_t count, M_PlaneEq* plane,
+                           M_Vector3T<double>* centroid);
+
+/// The plane through a point with a normal, which is kept as it is. Always 0.
+int32_t M_GetPlaneEquation2(const M_Vector3T<double>* point, const M_Vector3T<double>* normal,
+                            M_PlaneEq* plane);
+
+/// Where the ray's line meets the plane; with `forwardOnly` (of which the low byte counts) only in
+/// front of the origin. *hit is the point also where that is not the case, and the origin for a
+/// parallel ray. `behind` and `ok` may be null; they receive whether the point lies behind the
+/// origin and whether there is an intersection. Without `ok`, none is reported and returned as
+/// M_ERR_NO_PLANE_INTERSECTION.
+int32_t M_RayIntersectPlane(const M_PlaneEq* plane, int32_t forwardOnly, const M_Ray* ray,
+                            M_Vector3T<double>* hit, unsigned char* behind, unsigned char* ok);
+
+// ---------------------------------------------------------------------------------------------
+// Lines
+// ---------------------------------------------------------------------------------------------
+
+/// *distance = that of the point from the line through a and b; from a, if a and b coincide (within
+/// 1e-12). `onSegment` may be null; it receives 1 when the foot does not lie before a and the point
+/// is no farther from a than b is, else 0. Always 0.
+int32_t M_PerpDistTo2DLine(const M_Vector2T<double>* point, const M_Vector2T<double>* a,
+                           const M_Vector2T<double>* b, unsigned char* onSegment, double* distance);
+
+/// Tells which ends lie before the near plane, z < 0.1. If one of them does, *crossing is where the
+/// line meets the plane, else (0, 0, 0). Always 0.
+int32_t M_Clip3DLine(const M_Vector3T<double>* p0, const M_Vector3T<double>* p1,
+                     unsigned char* p0Clipped, unsigned char* p1Clipped,
+                     M_Vector3T<double>* crossing);
+
+/// Clips the line to the rectangle, edges included. *visible = whether something is left; the
+/// points may have been moved, too, where nothing is. A line along x or y is only visible if both
+/// ends are inside. Always 0.
+int32_t M_ClipLine2Rect(const M_FloatRect* rect, M_Vector2T<double>* p0, M_Vector2T<double>* p1,
+                        unsigned char* visible);
+
+// ---------------------------------------------------------------------------------------------
+// Directions. Bearings are in degrees where y runs downwards: 90 right, 180 down, 270 left, 360
+// straight up.
+// ---------------------------------------------------------------------------------------------
+
+/// What a matrix makes of the directions x and y.
+struct M_DirectionalComponents {
+  M_Vector2T<double> x;
+  M_Vector2T<double> y;
+};
+static_assert(sizeof(M_DirectionalComponents) == 32);
+
+M_DirectionalComponents M_ComputeDirectionalComponents(const M_Matrix3& m);
+
+/// The bearing of a vector; 90 for the zero vector.
+double M_VecToAngle(const M_Vector2T<double>& v);
+
+/// *angle = the bearing of a point from the centre of a rectangle. Always 0.
+int32_t M_Pt2Angle(const M_FloatRect* rect, const M_Vector2T<double>* point, double* angle);
+
+/// Rotates a point about a centre, from x towards y. `angle` in degrees. Always 0.
+int32_t M_TransformPtF(const M_Vector2T<float>* centre, double angle, M_Vector2T<float>* point);
 
 }  // extern "C"
 

@@ -31,9 +31,9 @@ std::string Normal(const std::string& expected) {
 class CasesTest : public HostTest, public ::testing::WithParamInterface<const char*> {};
 INSTANTIATE_TEST_SUITE_P(, CasesTest,
                          ::testing::Values("approximation", "bits", "clip", "fixed", "life",
-                                           "matrix3", "matrix4", "members", "points", "ratio",
-                                           "rectangles", "report", "rounding", "tables",
-                                           "transforms"),
+                                           "lines", "matrix3", "matrix4", "members", "points",
+                                           "ratio", "rectangles", "report", "rotations", "rounding",
+                                           "tables", "transforms"),
                          [](const auto& file) { return std::string(file.param); });
 
 TEST_P(CasesTest, GiveTheirResults) {

@@ -1,116 +1,8 @@
-// Points, rectangles, matrices and transforms. A point is written h,v and a rectangle
-// left,top,right,bottom, whatever its layout; vectors and matrices are lists of their elements.
+// Points, rectangles, matrices and transforms.
 
-#include <array>
-#include <charconv>
-#include <cmath>
-#include <cstring>
-
-#include "Cases.h"
-#include "M_Matrix.h"
-#include "M_Rect.h"
-
-// Found by Text() for the library's own types, so not in a namespace.
-
-static std::string NumberText(double d) {
-  if (std::isnan(d)) return "nan";
-  char text[32];
-  return {text, std::to_chars(text, text + sizeof text, d).ptr};
-}
-
-template <class Numbers>
-static std::string List(const Numbers& numbers) {
-  std::string text;
-  for (const auto number : numbers) {
-    text.append(text.empty() ? "" : ",").append(NumberText(static_cast<double>(number)));
-  }
-  return text;
-}
-
-template <class Point>
-concept IsPoint = requires(Point p) {
-  p.h;
-};
-template <class Rect>
-concept IsRect = requires(Rect r) {
-  r.bottom;
-};
-
-// Integers are written with all their digits.
-template <IsPoint Point>
-static std::string ToText(const Point& p) {
-  return std::to_string(p.h).append(",").append(std::to_string(p.v));
-}
-template <IsRect Rect>
-static std::string ToText(const Rect& r) {
-  return ToText(M_LPoint{r.left, r.top}).append(",").append(ToText(M_LPoint{r.right, r.bottom}));
-}
-static std::string ToText(const M_FloatRect& r) {
-  return List(std::array{r.left, r.top, r.right, r.bottom});
-}
-
-// Vectors and matrices, element by element.
-template <class Record>
-static std::string Elements(const Record& record) {
-  std::array<double, sizeof(Record) / 8> elements;
-  std::memcpy(elements.data(), &record, sizeof record);
-  return List(elements);
-}
-static std::string ToText(const M_Matrix3& m) { return Elements(m); }
-static std::string ToText(const M_Matrix4& m) { return Elements(m); }
-template <class T>
-static std::string ToText(const M_Vector2T<T>& v) {
-  return Elements(v);
-}
-template <class T>
-static std::string ToText(const M_Vector3T<T>& v) {
-  return Elements(v);
-}
-template <class T>
-static std::string ToText(const M_Vector4T<T>& v) {
-  return Elements(v);
-}
+#include "SpaceText.h"
 
 namespace {
-
-template <class Record>
-Record Read(Arguments& in) {
-  const std::vector<double> numbers = in.Doubles();
-  Record record;
-  if constexpr (IsPoint<Record>) {
-    record.h = static_cast<decltype(record.h)>(numbers.at(0));
-    record.v = static_cast<decltype(record.v)>(numbers.at(1));
-  } else if constexpr (IsRect<Record>) {
-    record.left = static_cast<decltype(record.left)>(numbers.at(0));
-    record.top = static_cast<decltype(record.top)>(numbers.at(1));
-    record.right = static_cast<decltype(record.right)>(numbers.at(2));
-    record.bottom = static_cast<decltype(record.bottom)>(numbers.at(3));
-  } else {
-    EXPECT_EQ(numbers.size() * 8, sizeof record);
-    std::memcpy(&record, numbers.data(), sizeof record);
-  }
-  return record;
-}
-
-// All elements, or those that differ from the identity: "I" nothing, "d,..." the diagonal, "t,..."
-// the last row, "w,..." the last column.
-template <class Matrix>
-Matrix ReadMatrix(Arguments& in) {
-  constexpr size_t kSize = std::size(Matrix{}.m);
-  Arguments whole = in;
-  const std::string word = in.Word();
-  if (!std::strchr("Idtw", word[0])) return Read<Matrix>(whole);
-  Arguments list(word.size() > 2 ? word.substr(2) : "0");
-  const std::vector<double> numbers = list.Doubles();
-  Matrix m = {};
-  for (size_t i = 0; i < kSize; ++i) m.m[i][i] = 1;
-  for (size_t i = 0; word[0] != 'I' && i < numbers.size(); ++i) {
-    (word[0] == 'd'   ? m.m[i][i]
-     : word[0] == 't' ? m.m[kSize - 1][i]
-                      : m.m[i][kSize - 1]) = numbers[i];
-  }
-  return m;
-}
 
 using Case = std::string (*)(Arguments&);
 
@@ -121,30 +13,6 @@ std::string Both(Arguments& in) {
   const std::string text = kLong(in);
   EXPECT_EQ(kFixed(again), text);
   return text;
-}
-
-// A binary operation with an output of its own, and with the output in a and in b.
-template <class Record>
-std::array<std::string, 3> InEachPlace(
-    const Record& a, const Record& b,
-    const std::function<int32_t(const Record*, const Record*, Record*)>& call) {
-  std::array<std::string, 3> results;
-  for (size_t place = 0; place < 3; ++place) {
-    std::array<Record, 3> records = {Record{}, a, b};
-    std::memset(&records[0], 0x77, sizeof(Record));
-    const int32_t code = call(&records[1], &records[2], &records[place]);
-    results[place] = Text(records[place]).append(Outcome(code));
-  }
-  return results;
-}
-
-template <class Record>
-std::string InAnyPlace(const Record& a, const Record& b,
-                       const std::function<int32_t(const Record*, const Record*, Record*)>& call) {
-  const auto results = InEachPlace<Record>(a, b, call);
-  EXPECT_EQ(results[1], results[0]) << "with the output in a";
-  EXPECT_EQ(results[2], results[0]) << "with the output in b";
-  return results[0];
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -408,21 +276,6 @@ std::string Normalize(Arguments& in) {
   auto v = Read<M_Vector4T<double>>(in);
   const std::string outcome = Thrown([&] { v.Normalize(); });
   return Text(v).append(outcome);
-}
-
-// Records up to the end of the line.
-template <class Record>
-std::vector<Record> ReadAll(Arguments& in) {
-  std::vector<Record> all;
-  while (!in.IsEmpty()) all.push_back(Read<Record>(in));
-  return all;
-}
-
-template <class Records>
-std::string TextOfAll(const Records& records) {
-  std::string text;
-  for (const auto& record : records) text += Text(record);
-  return text;
 }
 
 // One point by the singular members, several by the plural ones; the Fast ones do the same as far

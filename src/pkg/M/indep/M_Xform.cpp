@@ -12,10 +12,10 @@
 #include "M_Rect.h"
 #include "Mp_Arith.h"
 #include "Mp_Err.h"
+#include "Mp_Lanes.h"
 #include "Mp_Rect.h"
 #include "Mp_Round.h"
 #include "Mp_Tolerance.h"
-#include "Mp_Vector.h"
 
 namespace {
 

@@ -23,6 +23,7 @@ enum : int16_t {
   Mp_PLACE_TRANSFORM_FIX_POINTS = 39,
   Mp_PLACE_FTRIG = 42,
   Mp_PLACE_MATRIX4 = 45,
+  Mp_PLACE_RAY_INTERSECT_PLANE = 47,
 };
 
 /// Identifiers of the reports, and of the allocations, that go straight to the host.
@@ -39,6 +40,7 @@ enum : uint32_t {
   Mp_ID_SETDOWN_GAUSS = 0x11001E,
   Mp_ID_FCMD_UNAVAILABLE = 0x11001F,
   Mp_ID_FTRIG_UNAVAILABLE = 0x11002A,
+  Mp_ID_ROTATE_MATRIX4 = 0x11002E,
   Mp_ID_NORMALIZE = 0x110037,
   Mp_ID_TRANSFORM_POINT3 = 0x110039,
   Mp_ID_TRANSFORM_POINTS3 = 0x11003A,

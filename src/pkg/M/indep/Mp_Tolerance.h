@@ -13,8 +13,8 @@ inline constexpr double kTolerance = 1e-12;
 /// Strictly within the tolerance of 0. A NaN is not.
 constexpr bool IsNearZero(double value) { return -kTolerance < value && value < kTolerance; }
 
-/// Whether a and b differ by less than the tolerance relative to the larger (of two negative values,
-/// in magnitude), or by less than about 1e-12. A NaN equals nothing.
+/// Whether a and b differ by less than the tolerance relative to the larger (of two negative
+/// values, in magnitude), or by less than about 1e-12. A NaN equals nothing.
 constexpr bool IsNearlyEqual(double a, double b) {
   // 1e-12 without its low bits: 1.000088900582341e-12.
   constexpr double kLeast = 0x1.198p-40;

@@ -2,8 +2,8 @@
 /// Short vectors of numbers, which the compiler maps to what the processor has. A lane gives the
 /// bits that plain arithmetic gives. Everything is inlined: how a vector crosses a call would
 /// depend on what the caller is compiled for.
-#ifndef MP_VECTOR_H
-#define MP_VECTOR_H
+#ifndef MP_LANES_H
+#define MP_LANES_H
 
 #include <cstdint>
 #include <cstring>
@@ -135,4 +135,4 @@ struct Quadruples {
 
 }  // namespace Mp
 
-#endif  // MP_VECTOR_H
+#endif  // MP_LANES_H
