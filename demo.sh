@@ -8,4 +8,4 @@ need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libb
 build_preset release --target comp catalogues
 echo
 build/release/bin/comp examples/comp/samples/film.json examples/comp/samples/broadcast.json \
-  examples/comp/samples/sound.json examples/comp/samples/stage.json
+  examples/comp/samples/sound.json examples/comp/samples/stage.json examples/comp/samples/space.json

@@ -101,6 +101,14 @@ std::string Arguments::Word() {
   return IsEmpty() ? "0" : words_[next_++];
 }
 
+std::string Arguments::Number() {
+  const std::string word = Word();
+  const size_t comma = word.find(',');
+  if (comma == std::string::npos) return word;
+  words_[--next_] = word.substr(comma + 1);
+  return word.substr(0, comma);
+}
+
 std::vector<double> Arguments::Doubles() {
   std::istringstream list(Word());
   std::vector<double> all;

@@ -35,15 +35,16 @@ std::string Text(const Parts&... parts) {
 /// A code that is not 0, in hexadecimal as the codes are written, then all that the host was asked.
 std::string Outcome(int32_t code);
 
-/// The arguments of a line, taken one by one.
+/// The arguments of a line, taken one by one. Numbers may stand in a list with commas.
 class Arguments {
  public:
   explicit Arguments(const std::string& line);
   bool IsEmpty() const { return next_ == words_.size(); }
   std::string Word();
-  int32_t Int() { return static_cast<int32_t>(ToInteger(Word())); }
+  std::string Number();
+  int32_t Int() { return static_cast<int32_t>(ToInteger(Number())); }
   uint32_t Unsigned() { return static_cast<uint32_t>(Int()); }
-  double Double() { return ToDouble(Word()); }
+  double Double() { return ToDouble(Number()); }
   M_Ratio Ratio() { return ToRatio(Word()); }
   /// A list with commas.
   std::vector<double> Doubles();

@@ -60,10 +60,10 @@ std::string Elements(const Record& record) {
 }
 /// What comes from sines and roots, to nine places.
 template <class Record>
-std::string NearElements(Record record) {
+std::string NearElements(const Record& record, double unit = 1e9) {
   std::array<double, sizeof(Record) / 8> elements;
   std::memcpy(elements.data(), &record, sizeof record);
-  for (double& element : elements) element = std::round(element * 1e9) / 1e9 + 0.0;
+  for (double& element : elements) element = std::round(element * unit) / unit + 0.0;
   return List(elements);
 }
 inline std::string ToText(const M_Matrix3& m) { return Elements(m); }

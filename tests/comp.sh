@@ -14,14 +14,14 @@ fail() {
 }
 
 sheets() {
-  LC_ALL=C "$program" "$@" "$samples/film.json" "$samples/broadcast.json" "$samples/sound.json" "$samples/stage.json" "$tests/comp_odd.json"
+  LC_ALL=C "$program" "$@" "$samples/film.json" "$samples/broadcast.json" "$samples/sound.json" \
+    "$samples/stage.json" "$samples/space.json" "$tests/comp_odd.json"
 }
 sheets >"$work/sheets"
 diff "$tests/comp_sheets.txt" "$work/sheets" || fail "< the sheets as they should be, > as they are"
-# The same as JSON, here with a line for each layer, and without the last digits, which come from the
-# platform's sine.
-sheets --json | tr -d '\n' | sed -E 's/  */ /g; s/(\.[0-9]{6})[0-9]+/\1/g; s/[{] "name"/\
-&/g' >"$work/json"
+# The same as JSON, here with a line for each layer, and with numbers from the platform's sine rounded.
+sheets --json | tr -d '\n' | perl -pe 's/ +/ /g; s/\{ "name"/\n$&/g;
+  s/-?\d+\.\d{5,}(e-?\d+)?|-?\d+(\.\d+)?e-\d+/sprintf("%.4f", sprintf("%.4f", $&) + 0)/ge' >"$work/json"
 diff "$tests/comp_json.txt" "$work/json" || fail "< the JSON as it should be, > as it is"
 "$program" --help >"$work/help" && grep -q '^Usage: comp' "$work/help" || fail "--help does not help"
 

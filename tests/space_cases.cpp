@@ -1,6 +1,6 @@
 // Points, rectangles, matrices and transforms.
 
-#include "SpaceText.h"
+#include "Call.h"
 
 namespace {
 
@@ -18,55 +18,6 @@ std::string Both(Arguments& in) {
 // ---------------------------------------------------------------------------------------------
 // Points and rectangles
 // ---------------------------------------------------------------------------------------------
-
-template <class Point, class Rect, auto kSet, auto kCopy, auto kEqual, auto kSpan>
-std::string Points(Arguments& in) {
-  const auto given = Read<Point>(in);
-  const auto b = Read<Point>(in);
-  Point set, a;
-  Rect r;
-  const int32_t code = kSet(&set, given.h, given.v) | kCopy(&set, &a) | kSpan(&a, &b, &r);
-  EXPECT_EQ(std::memcmp(&a, &given, sizeof a), 0);
-  return Text(kEqual(&a, &b), r).append(Outcome(code));
-}
-
-std::string AddAndSubtract(Arguments& in) {
-  const auto a = Read<M_Point>(in);
-  auto b = Read<M_Point>(in);
-  const int64_t delta = M_DeltaPoint(a, b);
-  const int32_t code = M_AddPt(a, &b);
-  return Text(b, delta).append(Outcome(code));
-}
-
-template <class Point, class Rect, auto kInside>
-std::string Inside(Arguments& in) {
-  const auto pt = Read<Point>(in);
-  const auto r = Read<Rect>(in);
-  return Text(kInside(&pt, &r));
-}
-
-std::string Angle(Arguments& in) {
-  const auto r = Read<M_Rect>(in);
-  int16_t angle = 999;
-  const int32_t code = M_PtToAngle(&r, Read<M_Point>(in), &angle);
-  return Text(angle).append(Outcome(code));
-}
-
-template <class Rect, auto kMove>
-std::string Move(Arguments& in) {
-  auto r = Read<Rect>(in);
-  const auto by = Read<std::conditional_t<sizeof(Rect) == 8, M_Point, M_LPoint>>(in);
-  const int32_t code = kMove(&r, by.h, by.v);
-  return Text(r).append(Outcome(code));
-}
-
-template <class Rect, auto kCenter>
-std::string Center(Arguments& in) {
-  const auto container = Read<Rect>(in);
-  auto r = Read<Rect>(in), own = r;
-  const int32_t code = kCenter(&container, &r) | kCenter(&own, &own);
-  return Text(r).append(Outcome(code));
-}
 
 // Of two rectangles: whether they are equal, whether each is empty, their relations, their
 // intersection, their union and, where it is another one, their union into b.
@@ -92,13 +43,6 @@ std::string Rects(Arguments& in) {
       .append(unions[2] == unions[0] ? "" : unions[2]);
 }
 
-std::string FloatRects(Arguments& in) {
-  const auto a = Read<M_FloatRect>(in), b = Read<M_FloatRect>(in);
-  const std::string text = InAnyPlace<M_FloatRect>(a, b, M_SectFloatRect);
-  EXPECT_EQ(M_SectFloatRect(&a, &b, nullptr), text.ends_with(" 1"));
-  return text;
-}
-
 std::string FromFixed(Arguments& in) {
   const auto fixed = Read<M_FixedRect>(in);
   const auto convert = [&](auto toLong, auto toShort) {
@@ -115,15 +59,6 @@ std::string FromFixed(Arguments& in) {
          convert(M_FixedRect2LRectOut, M_FixedRect2RectOut);
 }
 
-template <class From, class To, auto kConvert>
-std::string Convert(Arguments& in) {
-  const auto from = Read<From>(in);
-  To to;
-  std::memset(&to, 0x11, sizeof to);
-  const int32_t code = kConvert(&from, &to);
-  return Text(to).append(Outcome(code));
-}
-
 // ---------------------------------------------------------------------------------------------
 // Matrices
 // ---------------------------------------------------------------------------------------------
@@ -134,44 +69,6 @@ std::string Equal(Arguments& in) {
   bool isEqual = false;
   const int32_t code = kEqual(&a, &b, &isEqual);
   return Text(isEqual, M_EqualMatrixWithinEpsilon(a, b, in.Double())).append(Outcome(code));
-}
-
-// A matrix to which something is appended, by up to four numbers.
-template <class Matrix, auto kAppend>
-std::string Append(Arguments& in) {
-  auto m = ReadMatrix<Matrix>(in);
-  int32_t code = 99;
-  const double a = in.Double(), b = in.Double();
-  if constexpr (requires { kAppend(&m, a, b); }) {
-    code = kAppend(&m, a, b);
-  } else if constexpr (requires { kAppend(&m, a, b, a); }) {
-    code = kAppend(&m, a, b, in.Double());
-  } else {
-    const double c = in.Double();
-    code = kAppend(&m, a, b, c, in.Double());
-  }
-  return Text(m).append(Outcome(code));
-}
-
-std::string Concat3(Arguments& in) {
-  const auto a = ReadMatrix<M_Matrix3>(in);
-  auto b = ReadMatrix<M_Matrix3>(in), square = a, product = a;
-  const int32_t code =
-      M_ConcatMatrix(&a, &b) | M_ConcatMatrix(&square, &square) | M_ConcatMatrix(&a, &product);
-  EXPECT_EQ(ToText(square), ToText(product));
-  return Text(b).append(Outcome(code));
-}
-
-std::string Concat4(Arguments& in) {
-  const auto a = ReadMatrix<M_Matrix4>(in);
-  return InAnyPlace<M_Matrix4>(a, ReadMatrix<M_Matrix4>(in), M_ConcatMatrix4);
-}
-
-std::string Type(Arguments& in) {
-  const auto m = ReadMatrix<M_Matrix3>(in);
-  uint32_t type = 99;
-  const int32_t code = M_GetMatrixType(&m, &type);
-  return Text(type).append(Outcome(code));
 }
 
 // The reporting form, which must do as the Quiet one does and report what that wants reported.
@@ -191,37 +88,6 @@ std::string Inverse(Arguments& in) {
     EXPECT_EQ(text.find(ToText(out)), 1u) << ToText(out);
   }
   return text;
-}
-
-std::string Quad(Arguments& in) {
-  const auto m = ReadMatrix<M_Matrix4>(in);
-  double determinant = 99;
-  M_Matrix4 transposed = m;
-  transposed.Transpose();
-  const std::string text =
-      InAnyPlace<M_Matrix4>(m, m, [](const M_Matrix4* a, const M_Matrix4*, M_Matrix4* out) {
-        return M_TransposeMatrix4(a, out);
-      });
-  EXPECT_EQ(text, Text(transposed));
-  const int32_t code = M_GetMatrix4Determinant(&m, &determinant);
-  return text + Text(NumberText(determinant)).append(Outcome(code));
-}
-
-std::string Widen(Arguments& in) {
-  const auto m3 = ReadMatrix<M_Matrix3>(in);
-  M_Matrix4 plain, uniform;
-  const int32_t code = M_Matrix3ToMatrix4(&m3, &plain) | M_Matrix3ToMatrix4Uniform(&m3, &uniform);
-  const double z = std::exchange(uniform.m[2][2], 1.0);
-  EXPECT_EQ(ToText(uniform), ToText(plain));
-  return Text(plain, NumberText(z)).append(Outcome(code));
-}
-
-std::string ChangeOfBasis(Arguments& in) {
-  const auto u = Read<M_Vector3T<double>>(in), v = Read<M_Vector3T<double>>(in);
-  const auto w = Read<M_Vector3T<double>>(in);
-  M_Matrix4 m;
-  const int32_t code = M_SetMatrix4CoB(&u, &v, &w, &m);
-  return Text(m).append(Outcome(code));
 }
 
 template <class Matrix>
@@ -326,31 +192,33 @@ std::string TransformRect(Arguments& in) {
   return Text(r).append(TextOfAll(corners)).append(Text(isBoundingBox)).append(outcome);
 }
 
-std::string TransformBounds(Arguments& in) {
-  const auto m = ReadMatrix<M_Matrix3>(in);
-  return Text(M_TransformBounds(m, Read<M_LRect>(in)));
-}
-
 using V2 = M_Vector2T<double>;
 using V3 = M_Vector3T<double>;
 using V4 = M_Vector4T<double>;
 
+constexpr CallOptions kFirstInOut = {.inOut = 1};
+constexpr CallOptions kSecondInOut = {.inOut = 2};
+
 const Operation kOperations[] = {
-    {"Points", Points<M_Point, M_Rect, M_SetPt, M_CopyPt, M_EqualPt, M_Pt2Rect>},
-    {"LPoints", Both<Points<M_LPoint, M_LRect, M_SetLPt, M_CopyLPt, M_EqualLPt, M_LPt2Rect>,
-                     Points<M_FixedPoint, M_FixedRect, M_SetFixedPt, M_CopyFixedPt, M_EqualFixedPt,
-                            M_FixedPt2Rect>>},
-    {"AddPtAndDeltaPoint", AddAndSubtract},
-    {"PtInRect", Inside<M_Point, M_Rect, M_PtInRect>},
-    {"LPtInRect", Both<Inside<M_LPoint, M_LRect, M_LPtInRect>,
-                       Inside<M_FixedPoint, M_FixedRect, M_FixedPtInRect>>},
-    {"PtToAngle", Angle},
-    {"InsetRect", Move<M_Rect, M_InsetRect>},
-    {"InsetLRect", Both<Move<M_LRect, M_InsetLRect>, Move<M_FixedRect, M_InsetFixedRect>>},
-    {"OffsetRect", Move<M_Rect, M_OffsetRect>},
-    {"OffsetLRect", Both<Move<M_LRect, M_OffsetLRect>, Move<M_FixedRect, M_OffsetFixedRect>>},
-    {"CenterRect", Center<M_Rect, M_CenterRect>},
-    {"CenterLRect", Both<Center<M_LRect, M_CenterLRect>, Center<M_FixedRect, M_CenterFixedRect>>},
+    {"SetPt", Call<M_SetPt>},
+    {"SetLPt", Both<Call<M_SetLPt>, Call<M_SetFixedPt>>},
+    {"CopyPt", Call<M_CopyPt>},
+    {"CopyLPt", Both<Call<M_CopyLPt>, Call<M_CopyFixedPt>>},
+    {"EqualPt", Call<M_EqualPt>},
+    {"EqualLPt", Both<Call<M_EqualLPt>, Call<M_EqualFixedPt>>},
+    {"Pt2Rect", Call<M_Pt2Rect>},
+    {"LPt2Rect", Both<Call<M_LPt2Rect>, Call<M_FixedPt2Rect>>},
+    {"AddPt", Call<M_AddPt, kSecondInOut>},
+    {"DeltaPoint", Call<M_DeltaPoint>},
+    {"PtInRect", Call<M_PtInRect>},
+    {"LPtInRect", Both<Call<M_LPtInRect>, Call<M_FixedPtInRect>>},
+    {"PtToAngle", Call<M_PtToAngle>},
+    {"InsetRect", Call<M_InsetRect, kFirstInOut>},
+    {"InsetLRect", Both<Call<M_InsetLRect, kFirstInOut>, Call<M_InsetFixedRect, kFirstInOut>>},
+    {"OffsetRect", Call<M_OffsetRect, kFirstInOut>},
+    {"OffsetLRect", Both<Call<M_OffsetLRect, kFirstInOut>, Call<M_OffsetFixedRect, kFirstInOut>>},
+    {"CenterRect", Call<M_CenterRect, kSecondInOut>},
+    {"CenterLRect", Both<Call<M_CenterLRect, kSecondInOut>, Call<M_CenterFixedRect, kSecondInOut>>},
     {"Rects", Rects<M_Rect, M_SetRect, M_CopyRect, M_EqualRect, M_EmptyRect, M_SectRect,
                     M_UnionRect, M_RectCompare>},
     {"LRects",
@@ -358,27 +226,29 @@ const Operation kOperations[] = {
                 M_UnionLRect, M_LRectCompare>,
           Rects<M_FixedRect, M_SetFixedRect, M_CopyFixedRect, M_EqualFixedRect, M_EmptyFixedRect,
                 M_SectFixedRect, M_UnionFixedRect, M_FixedRectCompare>>},
-    {"FloatRects", FloatRects},
+    {"SectFloatRect", Call<M_SectFloatRect, CallOptions{.nullable = 4}>},
     {"FromFixed", FromFixed},
-    {"Rect2FixedRect", Convert<M_Rect, M_FixedRect, M_Rect2FixedRect>},
-    {"LRect2FixedRect", Convert<M_LRect, M_FixedRect, M_LRect2FixedRect>},
-    {"LRect2Rect", Convert<M_LRect, M_Rect, M_LRect2Rect>},
+    {"Rect2FixedRect", Call<M_Rect2FixedRect>},
+    {"LRect2FixedRect", Call<M_LRect2FixedRect>},
+    {"LRect2Rect", Call<M_LRect2Rect>},
     {"EqualMatrix", Equal<M_Matrix3, M_EqualMatrix>},
     {"EqualMatrix4", Equal<M_Matrix4, M_EqualMatrix4>},
-    {"TranslateMatrix", Append<M_Matrix3, M_TranslateMatrix>},
-    {"RotateMatrix", Append<M_Matrix3, M_RotateMatrix>},
-    {"ScaleMatrix", Append<M_Matrix3, M_ScaleMatrix>},
-    {"TranslateMatrix4", Append<M_Matrix4, M_TranslateMatrix4>},
-    {"ScaleMatrix4", Append<M_Matrix4, M_ScaleMatrix4>},
-    {"ConcatMatrix", Concat3},
-    {"ConcatMatrix4", Concat4},
-    {"GetMatrixType", Type},
+    {"TranslateMatrix", Call<M_TranslateMatrix, kFirstInOut>},
+    {"RotateMatrix", Call<M_RotateMatrix, kFirstInOut>},
+    {"ScaleMatrix", Call<M_ScaleMatrix, kFirstInOut>},
+    {"TranslateMatrix4", Call<M_TranslateMatrix4, kFirstInOut>},
+    {"ScaleMatrix4", Call<M_ScaleMatrix4, kFirstInOut>},
+    {"ConcatMatrix", Call<M_ConcatMatrix, kSecondInOut>},
+    {"ConcatMatrix4", Call<M_ConcatMatrix4>},
+    {"GetMatrixType", Call<M_GetMatrixType>},
+    {"TransposeMatrix4", Call<M_TransposeMatrix4>},
+    {"GetMatrix4Determinant", Call<M_GetMatrix4Determinant>},
+    {"Matrix3ToMatrix4", Call<M_Matrix3ToMatrix4>},
+    {"Matrix3ToMatrix4Uniform", Call<M_Matrix3ToMatrix4Uniform>},
+    {"SetMatrix4CoB", Call<M_SetMatrix4CoB>},
     {"InverseMatrix", Inverse<M_Matrix3, M_InverseMatrix, M_InverseMatrixQuiet>},
     {"InverseMatrix4", Inverse<M_Matrix4, M_InverseMatrix4, M_InverseMatrix4Quiet>},
     {"CalcNormalMatrix4", Inverse<M_Matrix4, M_CalcNormalMatrix4, M_CalcNormalMatrix4Quiet, true>},
-    {"TransposeAndDeterminant4", Quad},
-    {"Matrix3ToMatrix4", Widen},
-    {"SetMatrix4CoB", ChangeOfBasis},
     {"IsWithinEpsilon", Within<M_Matrix3>},
     {"IsWithinEpsilon4", Within<M_Matrix4>},
     {"IsFinite", [](Arguments& in) { return Text(ReadMatrix<M_Matrix4>(in).IsFinite()); }},
@@ -401,7 +271,7 @@ const Operation kOperations[] = {
     {"TransformRect", TransformRect<M_Rect, V2, M_TransformRect>},
     {"TransformFloatRect", TransformRect<M_FloatRect, V2, M_TransformFloatRect>},
     {"TransformFixRect", TransformRect<M_FixedRect, M_FixedPoint, M_TransformFixRect>},
-    {"TransformBounds", TransformBounds},
+    {"TransformBounds", Call<M_TransformBounds>},
 };
 
 }  // namespace

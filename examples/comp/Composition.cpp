@@ -75,8 +75,31 @@ class Fields {
   double Number(const char* field) const { return ToNumber(field, Get(field)); }
 
   M_Vector2T<double> Pair(const char* field) const {
-    const Json& list = List(field);
-    return {ToNumber(field, list[0]), ToNumber(field, list[1])};
+    const auto numbers = Numbers<2>(field);
+    return {numbers[0], numbers[1]};
+  }
+
+  M_Vector3T<double> Triple(const char* field) const {
+    const auto numbers = Numbers<3>(field);
+    return {numbers[0], numbers[1], numbers[2]};
+  }
+
+  template <size_t kCount>
+  std::array<double, kCount> Numbers(const char* field) const {
+    const Json& list = List(field, kCount);
+    std::array<double, kCount> numbers;
+    for (size_t i = 0; i < kCount; ++i) numbers[i] = ToNumber(field, list[i]);
+    return numbers;
+  }
+
+  bool HasTriple(const char* field) const {
+    return Has(field) && Get(field).is_array() && Get(field).size() == 3;
+  }
+
+  // An object in a field, or in the list of one.
+  Fields Sub(const char* field, const Json& json, const std::string& what,
+             std::initializer_list<const char*> known) const {
+    return {json, place_ + ", field \"" + field + "\"" + what, known};
   }
 
   Size Pixels(const char* field) const {
@@ -86,14 +109,16 @@ class Fields {
       if (!isLength) ComplainAbout(field, value.dump() + " is not a whole number from 1 to 30000");
       return value.get<int32_t>();
     };
-    const Json& list = List(field);
+    const Json& list = List(field, 2);
     return {length(list[0]), length(list[1])};
   }
 
  private:
-  const Json& List(const char* field) const {
+  const Json& List(const char* field, size_t count) const {
     const Json& list = Get(field);
-    if (!list.is_array() || list.size() != 2) ComplainAbout(field, "is not a list of two numbers");
+    if (!list.is_array() || list.size() != count) {
+      ComplainAbout(field, "is not a list of " + std::to_string(count) + " numbers");
+    }
     return list;
   }
 
@@ -136,21 +161,95 @@ class Fields {
 
 M_Vector2T<double> Center(const Size& size) { return {size.width / 2.0, size.height / 2.0}; }
 
-std::optional<Placement> ReadPlacement(const Fields& fields, const std::optional<Size>& frame) {
-  if (!fields.Has("size")) {
-    for (const char* field : {"anchor", "position", "scale", "rotation"}) {
-      if (fields.Has(field)) fields.ComplainAbout(field, "places a layer that has no \"size\"");
-    }
-    return {};
+Orientation ReadOrientation(const Fields& fields) {
+  using Kind = Orientation::Kind;
+  if (fields.Has("angles")) {
+    const auto angles = fields.Numbers<3>("angles");
+    return {Kind::kAngles, {angles[0], angles[1], angles[2], 0}};
   }
-  if (!frame) fields.ComplainAbout("size", "needs a composition that has a \"size\"");
+  if (fields.Has("axis")) {
+    const auto axis = fields.Numbers<3>("axis");
+    return {Kind::kAxis, {axis[0], axis[1], axis[2], fields.Number("angle")}};
+  }
+  if (fields.Has("quaternion")) return {Kind::kQuaternion, fields.Numbers<4>("quaternion")};
+  fields.Complain("has neither \"angles\" nor an \"axis\" nor a \"quaternion\"");
+}
+
+constexpr auto kOrientationFields = {"angles", "axis", "angle", "quaternion"};
+constexpr auto kKeyFields = {"frame", "angles", "axis", "angle", "quaternion"};
+
+SpacePlacement ReadSpacePlacement(const Fields& fields) {
+  if (fields.Has("rotation")) {
+    fields.ComplainAbout("rotation", "is for layers in the frame; in space it is \"orientation\"");
+  }
+  SpacePlacement placement = {};
+  placement.size = fields.Pixels("size");
+  const M_Vector2T<double> center = Center(placement.size);
+  placement.anchor =
+      fields.Has("anchor") ? fields.Triple("anchor") : M_Vector3T<double>{center.x, center.y, 0};
+  placement.position = fields.Triple("position");
+  placement.scale = fields.Has("scale") ? fields.Triple("scale") : M_Vector3T<double>{1, 1, 1};
+  if (fields.Has("orientation")) {
+    placement.orientation = ReadOrientation(
+        fields.Sub("orientation", fields.Get("orientation"), "", kOrientationFields));
+  }
+  if (!fields.Has("keys")) return placement;
+  const Json& keys = fields.Get("keys");
+  if (!keys.is_array() || keys.empty()) fields.ComplainAbout("keys", "is not a list of keys");
+  for (const Json& json : keys) {
+    const std::string what = ", key " + std::to_string(placement.keys.size() + 1);
+    const Fields key = fields.Sub("keys", json, what, kKeyFields);
+    const int32_t frame = key.Whole("frame");
+    if (!placement.keys.empty() && frame <= placement.keys.back().frame) {
+      key.ComplainAbout("frame", "does not lie behind that of the key before");
+    }
+    placement.keys.push_back({frame, ReadOrientation(key)});
+  }
+  return placement;
+}
+
+Placement ReadPlacement(const Fields& fields, const Size& frame) {
+  for (const char* field : {"orientation", "keys"}) {
+    if (fields.Has(field)) fields.ComplainAbout(field, "needs a \"position\" of three numbers");
+  }
   Placement placement;
   placement.size = fields.Pixels("size");
   placement.anchor = fields.Has("anchor") ? fields.Pair("anchor") : Center(placement.size);
-  placement.position = fields.Has("position") ? fields.Pair("position") : Center(*frame);
+  placement.position = fields.Has("position") ? fields.Pair("position") : Center(frame);
   placement.scale = fields.Has("scale") ? fields.Pair("scale") : M_Vector2T<double>{1, 1};
   placement.rotation = fields.Has("rotation") ? fields.Number("rotation") : 0;
   return placement;
+}
+
+void ReadPlace(const Fields& fields, const std::optional<Size>& frame, Layer* layer) {
+  if (!fields.Has("size")) {
+    for (const char* field : {"anchor", "position", "scale", "rotation", "orientation", "keys"}) {
+      if (fields.Has(field)) fields.ComplainAbout(field, "places a layer that has no \"size\"");
+    }
+    return;
+  }
+  if (!frame) fields.ComplainAbout("size", "needs a composition that has a \"size\"");
+  if (fields.HasTriple("position")) {
+    layer->space = ReadSpacePlacement(fields);
+  } else {
+    layer->placement = ReadPlacement(fields, *frame);
+  }
+}
+
+// Without a camera, one from which the frame is seen as it is.
+Camera ReadCamera(const Fields& fields, const Size& frame) {
+  const M_Vector2T<double> center = Center(frame);
+  const double distance = frame.width;
+  Camera camera = {{center.x, center.y, -distance}, {center.x, center.y, 0}, {0, -1, 0}, distance};
+  if (!fields.Has("camera")) return camera;
+  const Fields given =
+      fields.Sub("camera", fields.Get("camera"), "", {"eye", "target", "up", "zoom"});
+  camera.eye = given.Triple("eye");
+  camera.target = given.Triple("target");
+  if (given.Has("up")) camera.up = given.Triple("up");
+  if (given.Has("zoom")) camera.zoom = given.Number("zoom");
+  if (camera.zoom <= 0) given.ComplainAbout("zoom", "is not greater than zero");
+  return camera;
 }
 
 Layer ReadLayer(const Json& json, const std::string& fileName, size_t number,
@@ -161,7 +260,7 @@ Layer ReadLayer(const Json& json, const std::string& fileName, size_t number,
   }
   const Fields fields(json, place,
                       {"name", "sourceRate", "timeBase", "in", "out", "stretch", "size", "anchor",
-                       "position", "scale", "rotation"});
+                       "position", "scale", "rotation", "orientation", "keys"});
   Layer layer;
   layer.name = fields.Name();
   layer.hasSourceRate = fields.Has("sourceRate");
@@ -177,7 +276,7 @@ Layer ReadLayer(const Json& json, const std::string& fileName, size_t number,
     fields.ComplainAbout("out", "lies more than 32 bits behind \"in\"");
   }
   layer.stretch = fields.Has("stretch") ? fields.Ratio("stretch", false) : GivenRatio{{1, 1}, {}};
-  layer.placement = ReadPlacement(fields, frame);
+  ReadPlace(fields, frame, &layer);
   return layer;
 }
 
@@ -210,14 +309,19 @@ Composition ReadComposition(std::istream& in, const std::string& fileName) {
     complain("a number is too large");
   }
   const Fields fields(json, fileName + ": composition",
-                      {"name", "frameRate", "start", "duration", "size", "layers"});
+                      {"name", "frameRate", "start", "duration", "size", "camera", "layers"});
   Composition composition;
   composition.name = fields.Name();
   composition.frameRate = fields.Ratio("frameRate", true);
   composition.start = fields.Whole("start");
   composition.duration = fields.Whole("duration");
   if (composition.duration <= 0) fields.ComplainAbout("duration", "is not greater than zero");
-  if (fields.Has("size")) composition.size = fields.Pixels("size");
+  if (fields.Has("size")) {
+    composition.size = fields.Pixels("size");
+    composition.camera = ReadCamera(fields, *composition.size);
+  } else if (fields.Has("camera")) {
+    fields.ComplainAbout("camera", "needs a composition that has a \"size\"");
+  }
   const Json& layers = fields.Get("layers");
   if (!layers.is_array()) fields.ComplainAbout("layers", "is not a list");
   for (const Json& layer : layers) {

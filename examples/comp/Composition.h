@@ -3,6 +3,7 @@
 #ifndef COMP_COMPOSITION_H
 #define COMP_COMPOSITION_H
 
+#include <array>
 #include <cstdint>
 #include <iosfwd>
 #include <optional>
@@ -42,14 +43,48 @@ struct Placement {
   double rotation;  ///< Degrees, clockwise.
 };
 
+/// How something is turned in space. Degrees.
+struct Orientation {
+  enum class Kind {
+    kAngles,      ///< About x, then about y and z as they have been turned by then.
+    kAxis,        ///< An axis and an angle.
+    kQuaternion,  ///< x, y, z, w.
+  };
+  Kind kind;
+  std::array<double, 4> values;
+};
+
+struct OrientationKey {
+  int32_t frame;
+  Orientation orientation;
+};
+
+/// How a layer is placed in space. Pixels, to the right, downwards and away from the viewer.
+struct SpacePlacement {
+  Size size;
+  M_Vector3T<double> anchor;
+  M_Vector3T<double> position;
+  M_Vector3T<double> scale;
+  Orientation orientation;
+  std::vector<OrientationKey> keys;  ///< By frame; instead of the orientation, if there are any.
+};
+
+struct Camera {
+  M_Vector3T<double> eye;
+  M_Vector3T<double> target;
+  M_Vector3T<double> up;
+  double zoom;  ///< How far from the eye a pixel is a pixel.
+};
+
 struct Layer {
   std::string name;
-  bool hasSourceRate;                  ///< The time base is the frames of a source rate.
-  GivenRatio timeBase;                 ///< Seconds a unit, or with a source rate units a second.
-  int32_t in;                          ///< First unit.
-  int32_t out;                         ///< The unit behind the last.
-  GivenRatio stretch;                  ///< Seconds on screen a second of the source.
-  std::optional<Placement> placement;  ///< None for what is not seen.
+  bool hasSourceRate;                   ///< The time base is the frames of a source rate.
+  GivenRatio timeBase;                  ///< Seconds a unit, or with a source rate units a second.
+  int32_t in;                           ///< First unit.
+  int32_t out;                          ///< The unit behind the last.
+  GivenRatio stretch;                   ///< Seconds on screen a second of the source.
+  std::optional<Placement> placement;   ///< In the frame, or
+  std::optional<SpacePlacement> space;  ///< in space, or neither for what is not seen.
 };
 
 struct Composition {
@@ -58,6 +93,7 @@ struct Composition {
   int32_t start;         ///< First frame.
   int32_t duration;      ///< Frames.
   std::optional<Size> size;
+  std::optional<Camera> camera;  ///< Where there is a size.
   std::vector<Layer> layers;
 };
 

@@ -1,8 +1,9 @@
 #include "LayoutText.h"
 
-#include <cmath>
 #include <cstdio>
 #include <nlohmann/json.hpp>
+
+#include "Wording.h"
 
 namespace comp {
 namespace {
@@ -26,28 +27,11 @@ const char* Name(uint32_t matrixType) {
   }
 }
 
-// To a thousandth of a pixel, and without a sign for what is 0 then.
-std::string ToText(double coordinate) {
-  char text[32];
-  std::snprintf(text, sizeof text, "%.10g", std::round(coordinate * 1000) / 1000 + 0.0);
-  return text;
-}
-
-std::string ToText(const Size& size) {
-  return std::to_string(size.width).append(" x ").append(std::to_string(size.height));
-}
-
 std::string ToText(const M_LRect& r) {
   if (M_EmptyLRect(&r)) return "nothing";
   char text[64];
   std::snprintf(text, sizeof text, "%d,%d to %d,%d", r.left, r.top, r.right, r.bottom);
   return text;
-}
-
-std::string Line(const std::string& label, const std::string& text) {
-  std::string line = std::string("  ").append(label);
-  line.resize(std::max<size_t>(line.size() + 1, 14), ' ');
-  return line.append(text).append("\n");
 }
 
 Json ToJson(const M_LRect& r) { return {r.left, r.top, r.right, r.bottom}; }
@@ -62,8 +46,7 @@ std::string ToTable(const Layout& layout) {
             Name(layer.matrixType) + (layer.isInvertible ? "\n" : ", which cannot be undone\n");
     std::string corners;
     for (const auto& corner : layer.corners) {
-      corners.append(corners.empty() ? "(" : " (").append(ToText(corner.x)).append(", ");
-      corners.append(ToText(corner.y)).append(")");
+      corners.append(corners.empty() ? "" : " ").append(comp::ToText({corner.x, corner.y}));
     }
     text += Line("corners", corners);
     text += Line("pixels", ToText(layer.bounds));

@@ -1,5 +1,6 @@
 #include "Sheet.h"
 
+#include <algorithm>
 #include <numeric>
 
 namespace comp {
@@ -43,13 +44,11 @@ class SheetMaker {
   }
 
   Sheet Make(ReportCollector& collector) const {
-    Sheet sheet = {composition_.name,
-                   composition_.frameRate,
-                   InFrames(start_),
-                   InFrames(duration_),
-                   {},
-                   {},
-                   {}};
+    Sheet sheet;
+    sheet.name = composition_.name;
+    sheet.frameRate = composition_.frameRate;
+    sheet.start = InFrames(start_);
+    sheet.duration = InFrames(duration_);
     Value sum = {{0, 1}, Accuracy::kExact};
     for (const Layer& layer : composition_.layers) {
       collector.SetLayer(layer.name);
@@ -59,6 +58,10 @@ class SheetMaker {
       sheet.rows.push_back(std::move(row));
     }
     sheet.layout = MakeLayout(composition_, collector);
+    const auto isInSpace = [](const Layer& layer) { return layer.space.has_value(); };
+    if (std::ranges::any_of(composition_.layers, isInSpace)) {
+      sheet.scene = MakeScene(composition_, collector);
+    }
     sheet.reports = collector.Reports();
     return sheet;
   }

@@ -11,6 +11,7 @@
 #include "Layout.h"
 #include "M_Utils.h"
 #include "Reports.h"
+#include "Scene.h"
 
 namespace comp {
 
@@ -57,6 +58,7 @@ struct Sheet {
   Time start, duration;
   std::vector<Row> rows;
   std::optional<Layout> layout;
+  std::optional<Scene> scene;   ///< Where there are layers in space.
   std::vector<Report> reports;  ///< What the library reported on the way.
 };
 

@@ -4,6 +4,7 @@
 #include <nlohmann/json.hpp>
 
 #include "LayoutText.h"
+#include "SceneText.h"
 
 namespace comp {
 namespace {
@@ -116,6 +117,7 @@ std::string ToTable(const Sheet& sheet) {
   text += '\n';
   text += "~ marks what is not exact: frames are rounded, ratios the nearest that fit.\n";
   if (sheet.layout) text.append("\n").append(ToTable(*sheet.layout));
+  if (sheet.scene) text.append("\n").append(ToTable(*sheet.scene));
   if (!sheet.reports.empty()) text += "\nReported by the library:\n";
   for (const Report& report : sheet.reports) {
     text.append("  [").append(IdText(report.id)).append("] ").append(report.text);
@@ -145,6 +147,7 @@ std::string ToJson(const Sheet& sheet) {
                               {"runningSum", ToJson(row.runningSum)}});
   }
   if (sheet.layout) json["layout"] = ToJson(*sheet.layout);
+  if (sheet.scene) json["space"] = ToJson(*sheet.scene);
   for (const Report& report : sheet.reports) {
     json["reports"].push_back({{"layer", report.layer},
                                {"id", IdText(report.id)},

@@ -23,7 +23,8 @@ and for every layer its in and out points as exact ratios in seconds and as
 frames, also clipped to the composition, its stretch and the running sum of the
 durations. For a composition with a size also where its layers lie: what kind of
 matrix places each of them, its corners, the pixels it touches, those in the
-frame and those above each layer below it.
+frame and those above each layer below it; and for layers in space how they are
+moved, scaled, sheared and turned, and where the camera sees them.
 
   --json  prints the sheet as JSON
   --help  prints this text
@@ -36,6 +37,10 @@ A composition file is a JSON object:
   duration   number of frames
   size       width and height of the frame in pixels, [1920, 1080]; may be left
              out, and so may all that follows from it
+  camera     for layers in space; one that sees the frame as it is, if left out:
+    eye, target  points [x, y, z]: right, down, and away from the viewer
+    up           a direction, [0, -1, 0] if left out
+    zoom         pixels; the width of the frame if left out
   layers     list of layers, the topmost first:
     name        text
     timeBase    seconds a unit, such as "1/600" or "1/48000", or instead
@@ -47,6 +52,11 @@ A composition file is a JSON object:
     position    where in the frame; the centre if left out
     scale       about the anchor, [1, 1] if left out
     rotation    about the anchor, in degrees, clockwise; 0 if left out
+    A position [x, y, z] puts the layer into space. Anchor and scale then have
+    three numbers, too, and instead of a rotation it has
+    orientation {"angles": [x, y, z]}, {"axis": [x, y, z], "angle": a} in
+                degrees, or {"quaternion": [x, y, z, w]}
+    keys        list of orientations with a "frame" each, between which it turns
 
 Exit status: 0 if every sheet was printed, 1 if the output cannot be written, 2
 if an argument or a file cannot be used. The library's own reports are part of

@@ -1,0 +1,47 @@
+/// \file
+/// The layers of a composition that are placed in space, and the camera that looks at them.
+#ifndef COMP_SCENE_H
+#define COMP_SCENE_H
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "Composition.h"
+#include "M_Matrix.h"
+#include "Reports.h"
+
+namespace comp {
+
+/// An orientation between two keys, or at one.
+struct OrientationSample {
+  double frame;
+  std::array<double, 4> quaternion;
+  M_Vector3T<double> angles;  ///< Degrees, about x and then the turned y and z.
+};
+
+struct SpaceLayer {
+  std::string name;
+  Size size;
+  M_Matrix4 matrix;     ///< From the layer to the world, at the first key.
+  bool isDecomposable;  ///< What follows is zero if it is not.
+  M_Matrix4Decomp decomp;
+  M_Vector3T<double> anglesZYX;               ///< Radians, in the other order.
+  std::array<M_Vector3T<double>, 4> corners;  ///< As the eye sees them: right, down, away.
+  std::vector<M_Vector3T<double>> crossings;  ///< Where edges pass through the near plane.
+  std::vector<OrientationSample> samples;     ///< From the first key to the last.
+};
+
+struct Scene {
+  Camera camera;
+  M_Matrix4 view;  ///< From the world to the eye.
+  std::vector<SpaceLayer> layers;
+};
+
+/// The scene of a composition with a size.
+Scene MakeScene(const Composition& composition, ReportCollector& collector);
+
+}  // namespace comp
+
+#endif  // COMP_SCENE_H

@@ -1,0 +1,35 @@
+#include "Wording.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+
+namespace comp {
+
+std::string ToText(double number) {
+  char text[32];
+  std::snprintf(text, sizeof text, "%.10g", std::round(number * 1000) / 1000 + 0.0);
+  return text;
+}
+
+std::string ToText(std::initializer_list<double> numbers) {
+  std::string text;
+  for (const double number : numbers) {
+    text.append(text.empty() ? "(" : ", ").append(ToText(number));
+  }
+  return text.append(")");
+}
+
+std::string ToText(const M_Vector3T<double>& v) { return ToText({v.x, v.y, v.z}); }
+
+std::string ToText(const Size& size) {
+  return std::to_string(size.width).append(" x ").append(std::to_string(size.height));
+}
+
+std::string Line(const std::string& label, const std::string& text) {
+  std::string line = std::string("  ").append(label);
+  line.resize(std::max<size_t>(line.size() + 1, 14), ' ');
+  return line.append(text).append("\n");
+}
+
+}  // namespace comp

@@ -1,0 +1,28 @@
+/// \file
+/// Numbers and lines as the tables of places show them.
+#ifndef COMP_WORDING_H
+#define COMP_WORDING_H
+
+#include <initializer_list>
+#include <string>
+
+#include "Composition.h"
+
+namespace comp {
+
+/// To a thousandth, and without a sign for what is 0 then.
+std::string ToText(double number);
+
+/// "(1, 2, 3)"
+std::string ToText(std::initializer_list<double> numbers);
+std::string ToText(const M_Vector3T<double>& v);
+
+/// "1920 x 1080"
+std::string ToText(const Size& size);
+
+/// An indented line with a label.
+std::string Line(const std::string& label, const std::string& text);
+
+}  // namespace comp
+
+#endif  // COMP_WORDING_H
