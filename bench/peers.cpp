@@ -8,11 +8,16 @@
 #ifdef BENCH_HAS_IMATH
 #include <ImathBox.h>
 #include <ImathMatrix.h>
+#include <ImathMatrixAlgo.h>
+#include <ImathQuat.h>
 #include <ImathVec.h>
 #endif
 #ifdef BENCH_HAS_GLM
-#define GLM_FORCE_XYZW_ONLY
+#define GLM_ENABLE_EXPERIMENTAL
 #include <glm/glm.hpp>
+#include <glm/gtc/matrix_transform.hpp>
+#include <glm/gtc/quaternion.hpp>
+#include <glm/gtx/matrix_decompose.hpp>
 #endif
 #ifdef BENCH_HAS_EIGEN
 #include <Eigen/Geometry>
@@ -66,6 +71,21 @@ bool TransformFixed(int groups, int count, void* points, Transform transform) {
 struct Pair {
   double x, y;
 };
+
+struct Parts {
+  double values[12];
+};
+
+// A matrix that something is appended to, and that no compiler knows.
+template <class Matrix>
+const Matrix kTurned = [] {
+  const double volatile elements[16] = {0.6, 0.8, 0, 0, -0.8, 0.6, 0, 0, 0, 0, 1, 0, 1, 2, 3, 1};
+  double copy[16];
+  for (int i = 0; i < 16; ++i) copy[i] = elements[i];
+  Matrix m;
+  std::memcpy(&m, copy, sizeof m);
+  return m;
+}();
 
 // One operation on arrays of M's records, through a peer's types of the same bytes.
 template <class A, class Out, class Work>
@@ -158,6 +178,37 @@ void AddImath(Peers& peers) {
     ForAll<M33d, M33d>(count, a, b, out, [](const M33d& p, const M33d&) { return p.gjInverse(); });
   });
   peers.operations.back().peer = "Imath Gauss-Jordan";
+  operation("axis-angle", [](int count, const void* a, const void* b, void* out) {
+    ForAll<V4d, M44d>(count, a, b, out, [](const V4d& p, const V4d&) {
+      M44d m;
+      m.setAxisAngle(V3d(p.x, p.y, p.z), p.w);
+      return kTurned<M44d> * m;
+    });
+  });
+  operation("decomposition", [](int count, const void* a, const void* b, void* out) {
+    ForAll<M44d, Parts>(count, a, b, out, [](const M44d& m, const M44d&) {
+      V3d s, h, r, t;
+      extractSHRT(m, s, h, r, t, false);
+      return Parts{t.x, t.y, t.z, s.x, s.y, s.z, h.x, h.y, h.z, r.x, r.y, r.z};
+    });
+  });
+  operation("quaternion to matrix", [](int count, const void* a, const void* b, void* out) {
+    ForAll<V4d, M44d>(count, a, b, out, [](const V4d& q, const V4d&) {
+      return Quatd(q.w, q.x, q.y, q.z).toMatrix44();
+    });
+  });
+  operation("matrix to quaternion", [](int count, const void* a, const void* b, void* out) {
+    ForAll<M44d, V4d>(count, a, b, out, [](const M44d& m, const M44d&) {
+      const Quatd q = extractQuat(m);
+      return V4d(q.v.x, q.v.y, q.v.z, q.r);
+    });
+  });
+  operation("slerp", [](int count, const void* a, const void* b, void* out) {
+    ForAll<V4d, V4d>(count, a, b, out, [](const V4d& p, const V4d& q) {
+      const Quatd r = slerpShortestArc(Quatd(p.w, p.x, p.y, p.z), Quatd(q.w, q.x, q.y, q.z), 0.3);
+      return V4d(r.v.x, r.v.y, r.v.z, r.r);
+    });
+  });
   operation("long union", [](int count, const void* a, const void* b, void* out) {
     ForAll<Box2i, Box2i>(count, a, b, out, [](Box2i p, const Box2i& q) {
       p.extendBy(q);
@@ -256,6 +307,38 @@ void AddGlm(Peers& peers) {
   });
   operation("3x3 inverse", [](int count, const void* a, const void* b, void* out) {
     ForAll<dmat3, dmat3>(count, a, b, out, [](const dmat3& p, const dmat3&) { return inverse(p); });
+  });
+  operation("axis-angle", [](int count, const void* a, const void* b, void* out) {
+    ForAll<dvec4, dmat4>(count, a, b, out, [](const dvec4& p, const dvec4&) {
+      return rotate(kTurned<dmat4>, p.w, dvec3(p));
+    });
+  });
+  operation("decomposition", [](int count, const void* a, const void* b, void* out) {
+    ForAll<dmat4, Parts>(count, a, b, out, [](const dmat4& m, const dmat4&) {
+      dvec3 s, t, h;
+      dquat q;
+      dvec4 perspective;
+      decompose(m, s, q, t, h, perspective);
+      const dvec3 r = eulerAngles(q);
+      return Parts{{t.x, t.y, t.z, s.x, s.y, s.z, h.x, h.y, h.z, r.x, r.y, r.z}};
+    });
+  });
+  operation("quaternion to matrix", [](int count, const void* a, const void* b, void* out) {
+    ForAll<dvec4, dmat4>(count, a, b, out, [](const dvec4& q, const dvec4&) {
+      return mat4_cast(dquat(q.w, q.x, q.y, q.z));
+    });
+  });
+  operation("matrix to quaternion", [](int count, const void* a, const void* b, void* out) {
+    ForAll<dmat4, dvec4>(count, a, b, out, [](const dmat4& m, const dmat4&) {
+      const dquat q = quat_cast(m);
+      return dvec4(q.x, q.y, q.z, q.w);
+    });
+  });
+  operation("slerp", [](int count, const void* a, const void* b, void* out) {
+    ForAll<dvec4, dvec4>(count, a, b, out, [](const dvec4& p, const dvec4& q) {
+      const dquat r = slerp(dquat(p.w, p.x, p.y, p.z), dquat(q.w, q.x, q.y, q.z), 0.3);
+      return dvec4(r.x, r.y, r.z, r.w);
+    });
   });
 }
 #endif
@@ -364,6 +447,38 @@ void AddEigen(Peers& peers) {
   });
   operation("3x3 inverse", [](int count, const void* a, const void*, void* out) {
     for (int i = 0; i < count; ++i) threeOut(out, i) = three(a, i).inverse();
+  });
+  using Quaternions = Map<const Quaterniond>;
+  static const auto quaternion = [](const void* p, int i) {
+    return Quaternions(static_cast<const double*>(p) + 4 * i);
+  };
+  operation("axis-angle", [](int count, const void* a, const void*, void* out) {
+    for (int i = 0; i < count; ++i) {
+      const double* const p = static_cast<const double*>(a) + 4 * i;
+      Matrix4d rotation = Matrix4d::Identity();
+      rotation.topLeftCorner<3, 3>() =
+          AngleAxisd(p[3], Vector3d(p[0], p[1], p[2]).normalized()).toRotationMatrix();
+      fourOut(out, i).noalias() = rotation * kTurned<Matrix4d>;
+    }
+  });
+  operation("quaternion to matrix", [](int count, const void* a, const void*, void* out) {
+    for (int i = 0; i < count; ++i) {
+      Matrix4d m = Matrix4d::Identity();
+      m.topLeftCorner<3, 3>() = quaternion(a, i).toRotationMatrix();
+      fourOut(out, i) = m;
+    }
+  });
+  operation("matrix to quaternion", [](int count, const void* a, const void*, void* out) {
+    for (int i = 0; i < count; ++i) {
+      Map<Quaterniond>(static_cast<double*>(out) + 4 * i) =
+          Quaterniond(Matrix3d(four(a, i).topLeftCorner<3, 3>()));
+    }
+  });
+  operation("slerp", [](int count, const void* a, const void* b, void* out) {
+    for (int i = 0; i < count; ++i) {
+      Map<Quaterniond>(static_cast<double*>(out) + 4 * i) =
+          quaternion(a, i).slerp(0.3, quaternion(b, i));
+    }
   });
   // Of an empty intersection Eigen keeps the edges; M gives zeros.
   operation("long intersection", [](int count, const void* a, const void* b, void* out) {

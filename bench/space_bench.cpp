@@ -49,6 +49,9 @@ const M_Matrix4 kTurn4 = [] {
   return m;
 }();
 
+// What rotations are appended to.
+const M_Matrix4 kTurned = {{{0.6, 0.8, 0, 0}, {-0.8, 0.6, 0, 0}, {0, 0, 1, 0}, {1, 2, 3, 1}}};
+
 // A turn as a camera sees it: into perspective, turned, and back.
 const M_Matrix4 kPerspective = [] {
   M_Matrix4 camera, inverse, m;
@@ -206,6 +209,41 @@ void RegisterAll(const std::vector<const bench::Peers*>& peers) {
   });
   Operations<M_Matrix3, M_Matrix3>("3x3 inverse", peers, a3, b3,
                                    [](auto& a, auto&, auto& out) { M_InverseMatrix(&a, &out); });
+
+  // Axes and angles, unit quaternions, and matrices that scale, shear, rotate and translate.
+  std::vector<M_Vector4T<double>> axes(kOperands), quaternions(kOperands), others4(kOperands);
+  std::vector<M_Matrix4> affine(kOperands), rotations(kOperands);
+  for (size_t i = 0; i < kOperands; ++i) {
+    const auto any = [] { return Uniform(-1, 1); };
+    axes[i] = {any(), any(), any(), Uniform(-3, 3)};
+    for (auto* q : {&quaternions[i], &others4[i]}) {
+      *q = {any(), any(), any(), any()};
+      const double r = 1 / std::sqrt(q->x * q->x + q->y * q->y + q->z * q->z + q->w * q->w);
+      *q = {q->x * r, q->y * r, q->z * r, q->w * r};
+    }
+    M_QuatToMatrix4(&quaternions[i].x, &rotations[i]);
+    affine[i] = a4[i];
+    for (auto& row : affine[i].m) row[3] = 0;
+    affine[i].m[3][3] = 1;
+  }
+  Operations<M_Vector4T<double>, M_Matrix4>("axis-angle", peers, axes, axes,
+                                            [](auto& a, auto&, auto& out) {
+                                              out = kTurned;
+                                              M_RotateMatrix4(&out, a.x, a.y, a.z, a.w);
+                                            });
+  Operations<M_Matrix4, M_Matrix4Decomp>(
+      "decomposition", peers, affine, affine,
+      [](auto& a, auto&, auto& out) { M_DecomposeMatrix4(&a, &out, nullptr); });
+  Operations<M_Vector4T<double>, M_Matrix4>(
+      "quaternion to matrix", peers, quaternions, quaternions,
+      [](auto& a, auto&, auto& out) { M_QuatToMatrix4(&a.x, &out); });
+  Operations<M_Matrix4, M_Vector4T<double>>(
+      "matrix to quaternion", peers, rotations, rotations,
+      [](auto& a, auto&, auto& out) { M_Matrix4ToQuat(&a, &out.x); });
+  Operations<M_Vector4T<double>, M_Vector4T<double>>(
+      "slerp", peers, quaternions, others4,
+      [](auto& a, auto& b, auto& out) { M_Slerp(&a.x, &b.x, &out.x, 0.3); });
+
   const auto rects = RandomRects<M_LRect>(1000), others = RandomRects<M_LRect>(1000);
   Operations<M_LRect, M_LRect>("long intersection", peers, rects, others,
                                [](auto& a, auto& b, auto& out) { M_SectLRect(&a, &b, &out); });

@@ -18,14 +18,12 @@ constexpr bool IsNearZero(double value) { return -kTolerance < value && value < 
 constexpr bool IsNearlyEqual(double a, double b) {
   // 1e-12 without its low bits: 1.000088900582341e-12.
   constexpr double kLeast = 0x1.198p-40;
-  double larger = a > b ? a : b;
-  double smaller = a > b ? b : a;
-  if (larger < 0) {
-    const double magnitude = -smaller;
-    smaller = -larger;
-    larger = magnitude;
-  }
-  return larger - smaller < std::max(kLeast, kTolerance * larger);
+  const double larger = a > b ? a : b;
+  const double smaller = a > b ? b : a;
+  // Of two negative values -smaller has the larger magnitude. Where only one is negative it may
+  // have it, too, but then they differ by more than that.
+  const double magnitude = std::max(larger, -smaller);
+  return larger - smaller < std::max(kLeast, kTolerance * magnitude);
 }
 
 }  // namespace Mp
