@@ -146,17 +146,16 @@ int32_t M_Clip3DLine(const M_Vector3T<double>* p0, const M_Vector3T<double>* p1,
                      M_Vector3T<double>* crossing) {
   const bool isNone = p0->z >= kNearPlane && p1->z >= kNearPlane;
   const bool isAll = IsClipped(*p0) && IsClipped(*p1);
+  *p0Clipped = *p1Clipped = isAll;
   if (isNone || isAll) {
-    *p0Clipped = isAll;
-    *p1Clipped = isAll;
     *crossing = {0, 0, 0};
     return 0;
   }
   const bool isP1 = p0->z > p1->z;
   const Vector3 clipped = isP1 ? *p1 : *p0;
   const Vector3 seen = isP1 ? *p0 : *p1;
-  *p0Clipped = !isP1;
-  *p1Clipped = isP1;
+  // Last, so that both flags may be the same.
+  *(isP1 ? p1Clipped : p0Clipped) = 1;
   const double t = (kNearPlane - clipped.z) / std::abs(seen.z - clipped.z);
   *crossing = PointOnLine(clipped, t, Mp::Difference(seen, clipped));
   return 0;

@@ -4,7 +4,6 @@
 
 #include "M_Matrix.h"
 #include "M_Rect.h"
-#include "Mp_Decomp.h"
 #include "Mp_Err.h"
 #include "Mp_Matrix.h"
 #include "Mp_Tolerance.h"
