@@ -292,19 +292,21 @@ static_assert(offsetof(M_Matrix4Decomp, shear) == 48 && offsetof(M_Matrix4Decomp
 /// *d := m / m[3][3] as L x R x T: L = {{sx, 0, 0}, {xy, sy, 0}, {xz, yz, sz}} of scale and shear
 /// (where the scales are negated for a mirror, L has the shears with the other sign), R = Rz x Ry x
 /// Rx, which M_RotateMatrix4XYZ makes of the angles, and the translation T.
-/// M_ERR_NOT_DECOMPOSABLE, with all of *d zero, when m[3][3] is 0 or the rest of the last column is
-/// not. `failed` may be null: then a failure is reported. Otherwise it is set to 1 by a failure and
-/// left alone by a success. With a zero row there is no failure, but the angles mean little.
+/// M_ERR_NOT_DECOMPOSABLE, with all of *d zero, when m[3][3] is 0 or the rest of the last column,
+/// divided by it, is not. `failed` may be null: then a failure is reported. Otherwise it is set to
+/// 1 by a failure and left alone by a success. With a zero row there is no failure, but the angles
+/// mean little.
 int32_t M_DecomposeMatrix4(const M_Matrix4* m, M_Matrix4Decomp* d, unsigned char* failed);
 
-/// As M_DecomposeMatrix4, but with the angles of R = Rx x Ry x Rz.
+/// As M_DecomposeMatrix4, but with the angles of R = Rx x Ry x Rz. (Where y is a quarter turn and
+/// row 2 nearly without y, but not quite, R may be half a turn off.)
 int32_t M_DecomposeMatrix4ZYX(const M_Matrix4* m, M_Matrix4Decomp* d, unsigned char* failed);
 
 /// The angles that M_DecomposeMatrix4 gives, in radians; zeros after a failure, which is reported.
 int32_t M_GetOrderedXYZRotationFromMatrix(const M_Matrix4* m, double* rx, double* ry, double* rz);
 
-/// Turns half turns about x or y, which are flips of a layer in the plane, into negative scales,
-/// and makes the z scale 1. Always 0.
+/// Turns half turns about x or y, which are flips of a layer in the plane, into a change of sign of
+/// the scale, and makes the z scale 1. Always 0.
 int32_t M_Correct3DDecompFor2D(M_Matrix4Decomp* d);
 
 // ---------------------------------------------------------------------------------------------
@@ -320,9 +322,9 @@ int32_t M_RotateMatrix4(M_Matrix4* m, double ax, double ay, double az, double ra
 /// M_RotateMatrix4's code if it fails; m is then untouched.
 int32_t M_RotateMatrix4XYZ(M_Matrix4* m, double rx, double ry, double rz);
 
-/// From the identity, as M_RotateMatrix4XYZ. Else about m's own axes, as m has them at each step;
-/// an axis that m takes to zero is left out. A failure's code is returned; m then holds the
-/// rotations made so far.
+/// From the identity, as M_RotateMatrix4XYZ. Else about the directions of m's own axes, as m has
+/// them at each step (divided by w where that is not 0), through the origin; an axis that m takes
+/// to zero is left out. A failure's code is returned; m then holds the rotations made so far.
 int32_t M_RotateMatrix4XYZPlus(bool fromIdentity, M_Matrix4* m, double rx, double ry, double rz);
 
 /// The angles about x, y and z, as M_DecomposeMatrix4 has them, of a rotation about an axis. Fails
@@ -331,8 +333,8 @@ int32_t M_ConvertAxisAngleToOrderedXYZRotation(double ax, double ay, double az, 
                                                double* rx, double* ry, double* rz);
 
 /// The orientation that looks from eye to target: rows sideways (up x forward), up and forward, and
-/// no translation. With up along the line of sight, the identity turned about x to look up or down;
-/// with eye at target, the identity.
+/// no translation. With up along the line of sight, or zero, the identity turned about x to look up
+/// or down; with eye at target, the identity.
 M_Matrix4 M_LookAtMatrix(const M_Vector3T<double>& eye, const M_Vector3T<double>& target,
                          const M_Vector3T<double>& up);
 
@@ -346,8 +348,8 @@ int32_t M_QuatToMatrix4(const double* q, M_Matrix4* m);
 /// The quaternion of a rotation; the last row and column are not looked at.
 int32_t M_Matrix4ToQuat(const M_Matrix4* m, double* q);
 
-/// From q0 (t = 0) to q1 (t = 1) the shorter way round, at a constant speed; along the chord where
-/// they nearly coincide, and q0 where they do.
+/// From the unit quaternion q0 (t = 0) to q1 (t = 1) the shorter way round, at a constant speed;
+/// along the chord where |q0 . q1| is within 1e-5 of 1 (or above), and q0 where they are equal.
 int32_t M_Slerp(const double* q0, const double* q1, double* out, double t);
 
 // ---------------------------------------------------------------------------------------------
@@ -372,8 +374,8 @@ static_assert(sizeof(M_Ray) == 64 && offsetof(M_Ray, direction) == 32);
 
 /// The plane of a polygon (Newell's method) through the mean of its points, which `centroid`
 /// receives unless it is null. The normal has unit length and points to where the polygon is seen
-/// counter-clockwise; for a polygon without area it is about zero. Of no points the mean and d are
-/// NaNs. Always 0.
+/// counter-clockwise; of a polygon without area it is zero or, as rounding has it, any. Of no
+/// points the mean and d are NaNs. Always 0.
 int32_t M_GetPlaneEquation(const M_Vector3T<double>* points, int32_t count, M_PlaneEq* plane,
                            M_Vector3T<double>* centroid);
 
@@ -393,21 +395,22 @@ int32_t M_RayIntersectPlane(const M_PlaneEq* plane, int32_t forwardOnly, const M
 // Lines
 // ---------------------------------------------------------------------------------------------
 
-/// *distance = that of the point from the line through a and b; from a, if a and b coincide (within
-/// 1e-12). `onSegment` may be null; it receives 1 when the foot does not lie before a and the point
-/// is no farther from a than b is, else 0. Always 0.
+/// *distance = that of the point from the line through a and b. `onSegment` may be null; it
+/// receives 1 when the foot does not lie before a and the point is no farther from a than b is,
+/// else 0. Where a and b are at most 1e-12 or more than 1e12 apart, the distance is that from a and
+/// onSegment 0. Always 0.
 int32_t M_PerpDistTo2DLine(const M_Vector2T<double>* point, const M_Vector2T<double>* a,
                            const M_Vector2T<double>* b, unsigned char* onSegment, double* distance);
 
 /// Tells which ends lie before the near plane, z < 0.1. If one of them does, *crossing is where the
-/// line meets the plane, else (0, 0, 0). Always 0.
+/// line meets the plane, else (0, 0, 0). Both flags may be the same. Always 0.
 int32_t M_Clip3DLine(const M_Vector3T<double>* p0, const M_Vector3T<double>* p1,
                      unsigned char* p0Clipped, unsigned char* p1Clipped,
                      M_Vector3T<double>* crossing);
 
-/// Clips the line to the rectangle, edges included. *visible = whether something is left; the
-/// points may have been moved, too, where nothing is. A line along x or y is only visible if both
-/// ends are inside. Always 0.
+/// Clips the line to the rectangle. *visible = whether something is left. A line with both ends
+/// inside, edges included, is; otherwise one that only touches the rectangle is not, and neither is
+/// one along x or y. The points may have been moved also where nothing is left. Always 0.
 int32_t M_ClipLine2Rect(const M_FloatRect* rect, M_Vector2T<double>* p0, M_Vector2T<double>* p1,
                         unsigned char* visible);
 

@@ -25,7 +25,7 @@ template <class Rect, auto kSet, auto kCopy, auto kEqual, auto kEmpty, auto kSec
           auto kCompare>
 std::string Rects(Arguments& in) {
   const auto given = Read<Rect>(in), b = Read<Rect>(in);
-  Rect set, a;
+  Rect set = {}, a = {};
   EXPECT_EQ(kSet(&set, given.left, given.top, given.right, given.bottom) | kCopy(&set, &a), 0);
   EXPECT_EQ(std::memcmp(&a, &given, sizeof a), 0);
   std::string relations;
@@ -46,8 +46,8 @@ std::string Rects(Arguments& in) {
 std::string FromFixed(Arguments& in) {
   const auto fixed = Read<M_FixedRect>(in);
   const auto convert = [&](auto toLong, auto toShort) {
-    M_LRect longs;
-    M_Rect shorts;
+    M_LRect longs = {};
+    M_Rect shorts = {};
     EXPECT_EQ(toLong(&fixed, &longs) | toShort(&fixed, &shorts), 0);
     const auto low = [](int32_t edge) { return static_cast<int16_t>(edge); };
     EXPECT_EQ(ToText(shorts),

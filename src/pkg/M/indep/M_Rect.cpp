@@ -305,12 +305,8 @@ int32_t M_PtToAngle(const M_Rect* r, M_Point pt, int16_t* angle) {
     a = up > 0 ? kQuarterTurn : -kQuarterTurn;
   }
   a = a / -kPi + 360.0 + 90.0;
-  // Kept on purpose: exactly 360, straight up, stays 360.
-  if (a > 360.0) {
-    a -= 360.0;
-  } else if (a < 0.0) {
-    a += 360.0;
-  }
+  // From 270 to 630. Kept on purpose: exactly 360, straight up, stays 360.
+  if (a > 360.0) a -= 360.0;
   *angle = static_cast<int16_t>(a);
   return 0;
 }
