@@ -1,5 +1,5 @@
 /// \file
-/// M_Matrix.h: vectors, matrices and the functions on them, rotations, planes and lines.
+/// M_Matrix.h: vectors, matrices, rotations, planes, lines, polygons and hulls.
 ///
 /// Contents
 ///   Vectors       M_Vector2T M_Vector3T M_Vector4T
@@ -19,6 +19,11 @@
 ///   Planes        M_GetPlaneEquation M_GetPlaneEquation2 M_RayIntersectPlane
 ///   Lines         M_PerpDistTo2DLine M_Clip3DLine M_ClipLine2Rect
 ///   Directions    M_ComputeDirectionalComponents M_VecToAngle M_Pt2Angle M_TransformPtF
+///   Polygons      M_IsFloatPointInConcavePoly M_IsFloatPointInQuad M_SignedPolygonArea2D
+///                 M_IsQuadEdgeOn M_PolyPolyClip2D
+///   Screen        M_TransformPoly2D M_TransformPoly3D M_GetMinimumEdgeDistance
+///                 M_TransformPoint2DtoScreen M_TransformPoint3DtoScreen
+///   Hulls         M_IsConvex M_ComputeConvexHull
 ///
 /// Conventions: points are row vectors on the left, p' = p x M, so translation is in the last row,
 /// the homogeneous column is the last, and in a product A x B the transform A acts first. Products
@@ -31,9 +36,13 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <iterator>
+#include <utility>
+#include <vector>
 
 #include "M_Rect.h"
 #include "M_Utils.h"
+#include "U.h"
 
 #pragma GCC visibility push(default)
 
@@ -437,7 +446,155 @@ int32_t M_Pt2Angle(const M_FloatRect* rect, const M_Vector2T<double>* point, dou
 /// Rotates a point about a centre, from x towards y. `angle` in degrees. Always 0.
 int32_t M_TransformPtF(const M_Vector2T<float>* centre, double angle, M_Vector2T<float>* point);
 
+// ---------------------------------------------------------------------------------------------
+// Polygons in the plane. The last point joins the first; they may be concave and run either way
+// round.
+// ---------------------------------------------------------------------------------------------
+
+/// As M_IsFloatPointInConcavePoly for four points and no tolerance.
+int32_t M_IsFloatPointInQuad(const M_Vector2T<double>* point, const M_Vector2T<double>* quad,
+                             unsigned char* inside);
+
+/// Positive where the points run counter-clockwise with y upwards; 0 for fewer than three.
+double M_SignedPolygonArea2D(const M_Vector2T<double>* poly, int32_t count);
+
+/// *isEdgeOn = whether the plane of the four transformed corners is seen from the side: the cosine
+/// between its normal and the line of sight is strictly within the tolerance. The line of sight is
+/// the z axis, or leads from the origin to the middle of the corners. 0 where there is no normal or
+/// no line. Always returns 0.
+int32_t M_IsQuadEdgeOn(const M_Matrix4* matrix, const M_Vector3T<double>* corners,
+                       unsigned char useZAxis, unsigned char* isEdgeOn, double tolerance);
+
+/// *result = the part of the subject inside the clipper, which must be convex and may run either
+/// way round. Points within 1e-6 of a side, in the measure of its cross product, count as outside.
+/// New points have z and w between those of their neighbours. An empty clipper clips nothing; fewer
+/// than three points of a subject are nothing. The result may be one of the others; it is what it
+/// was if an allocation fails, which throws.
+void M_PolyPolyClip2D(const std::vector<M_Vector4T<double>>* clipper,
+                      const std::vector<M_Vector4T<double>>* subject,
+                      std::vector<M_Vector4T<double>>* result);
+
+/// Through `first`, then `second`; the third columns are not used. Always true.
+bool M_TransformPoint2DtoScreen(const M_Matrix3& first, const M_Matrix3& second,
+                                M_Vector2T<double>* point);
+
 }  // extern "C"
+
+/// *inside = whether the point lies in the polygon, for points of double and of float:
+///
+///   inside or nearly on an edge that is not upright     1
+///   within `tolerance` of an edge or a corner           1 (a tolerance of 0 is not asked for)
+///   on an upright edge, on the side of larger x         1
+///   on an upright edge, on the side of smaller x        0
+///
+/// A polygon whose points are all the same is that point. A count below 1 gives 0. Returns 0, or
+/// what the host answers to an exception when there is no memory for more than 64 points, with
+/// *inside 0.
+template <class Point>
+int32_t M_IsFloatPointInConcavePoly(const Point* point, const Point* poly, int32_t count,
+                                    double tolerance, unsigned char* inside);
+
+// ---------------------------------------------------------------------------------------------
+// Quads on the screen. What they call throws its error code as an `int`.
+// ---------------------------------------------------------------------------------------------
+
+/// A quad on the screen. Edge i leads from corner i to the next.
+class M_TransformPoly2D {
+ public:
+  M_TransformPoly2D();  ///< Visible; the corners are left unset.
+  virtual ~M_TransformPoly2D();
+
+  /// As M_IsFloatPointInConcavePoly; false for a quad that is not visible.
+  bool IsPointInside(const M_Vector2T<double>* point, double tolerance) const;
+  double GetMinimumEdgeDistance(const M_Vector2T<double>* point) const;
+
+  M_Vector2T<double> points[4];
+  bool visible;
+};
+
+/// A quad in space on its way to the screen. Fill in `points`; then TransformPointsToEye,
+/// TransformPointsToScreen, and InitPolyPoints before the outline is used. A first or second row of
+/// a matrix that is zero (a squared length within 1e-12 of it) changes nothing but the clipped
+/// flags, which are cleared.
+class M_TransformPoly3D {
+ public:
+  M_TransformPoly3D();  ///< Nothing clipped, no outline; the corners are left unset.
+  virtual ~M_TransformPoly3D();
+
+  void TransformPointsToEye(const M_Matrix4& toEye);
+
+  /// Clips the edges to the near plane, z >= 0.1, and takes corners and crossings to the screen.
+  void TransformPointsToScreen(const M_Matrix4& toScreen);
+
+  /// Clips one edge, as it stands. The outline is left alone.
+  void ClipEdgeToScreen(int edge);
+
+  void InvalidatePolyPoints();
+
+  /// Makes the outline of what is visible, unless there is one.
+  void InitPolyPoints() const;
+
+  bool IsVisible() const;  ///< Not all corners are clipped.
+
+  /// False, with *out untouched, for a corner that is clipped, or an edge whose corners both are.
+  bool GetPoint(int corner, M_Vector2T<double>* out) const;
+  bool GetEdge(int edge, std::pair<M_Vector2T<double>, M_Vector2T<double>>* out) const;
+
+  int NumPolyPoints() const;
+  void GetPolyPoint(int index, M_Vector2T<double>* out) const;  ///< Not checked.
+
+  /// As M_IsFloatPointInConcavePoly for the outline as it is; false where there is none.
+  bool IsPointInside(const M_Vector2T<double>* point, double tolerance) const;
+  double GetMinimumEdgeDistance(const M_Vector2T<double>* point) const;
+
+  M_Vector3T<double> points[4];      ///< In the world, then as the eye sees them, then on screen.
+  M_Vector3T<double> clipPoints[4];  ///< Where edges cross the near plane.
+  unsigned char clipped[4];          ///< Corners before the near plane.
+  mutable std::vector<M_Vector2T<double>, U_Allocator<M_Vector2T<double>>> polyPoints;
+  mutable bool polyPointsValid;  ///< polyPoints is the outline. It is empty where it is not.
+};
+
+/// The distance of a point from the nearest visible edge of a quad; -1 where there is none.
+template <class Poly>
+double M_GetMinimumEdgeDistance(const M_Vector2T<double>* point, const Poly& poly);
+
+/// Through toEye, projection and toScreen, divided by w after the first and the last. False, with
+/// the point unchanged, when the eye sees it before the near plane. Throws M_ERR_W_IS_ZERO, after a
+/// report, where a w counts as zero.
+bool M_TransformPoint3DtoScreen(const M_Matrix4& toEye, const M_Matrix4& projection,
+                                const M_Matrix3& toScreen, M_Vector3T<double>* point);
+
+/// The same for a point with z = 0.
+bool M_TransformPoint3DtoScreen(const M_Matrix4& toEye, const M_Matrix4& projection,
+                                const M_Matrix3& toScreen, M_Vector2T<double>* point);
+
+// ---------------------------------------------------------------------------------------------
+// Convexity and hulls, by x and y. The ranges are const iterators of a vector, or const pointers,
+// of M_Vector2T, M_Vector3T or M_Vector4T of double, and for hulls of qelcore::geom::PointT<float>.
+// ---------------------------------------------------------------------------------------------
+
+/// A point on the lattice of hulls: 0 to 2^29 in each direction.
+struct M_LongPoint {
+  int32_t x;
+  int32_t y;
+};
+static_assert(sizeof(M_LongPoint) == 8 && offsetof(M_LongPoint, y) == 4);
+
+/// Whether the polygon turns the same way everywhere; true for fewer than three points, and for
+/// points on a line. Turns within the rounding of doubles are not counted, and going round twice is
+/// not noticed: a pentagram is convex.
+template <class Iterator>
+bool M_IsConvex(Iterator first, Iterator last);
+
+/// out = the corners of the hull, from the lowest (then leftmost) counter-clockwise with y upwards.
+/// The points are first moved to the nearest of 2^29 steps along each axis of their bounding box,
+/// and the corners are where they were moved to; other components are 0. Up to three points are
+/// copied as they are. Points on one line give the lowest, the farthest from it and the next
+/// farthest. A NaN counts as the least coordinate, unless all are; beside an infinity the corners'
+/// coordinates are NaNs. `out` may hold the points.
+template <class Iterator>
+void M_ComputeConvexHull(Iterator first, Iterator last,
+                         std::vector<typename std::iterator_traits<Iterator>::value_type>& out);
 
 #pragma GCC visibility pop
 

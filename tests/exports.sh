@@ -9,7 +9,8 @@ trap 'rm -rf "$work"' EXIT
 
 # The functions and objects that headers declare at the beginning of a line, in C.
 declared() {
-  sed -nE -e '/M_EqualMatrixWithinEpsilon|M_GetMatrix3DeterminantPlus/d' \
+  sed -nE -e '/EqualMatrixWithinEpsilon|GetMatrix3DeterminantPlus|TransformPoint3DtoScreen/d' \
+    -e '/IsFloatPointInConcavePoly|GetMinimumEdgeDistance|IsConvex|ComputeConvexHull/d' \
     -e 's/^[A-Za-z_][A-Za-z0-9_ *&]*[ *&](Mp?_[A-Za-z0-9_]+)\(.*/\1/p' \
     -e 's/^extern [A-Za-z0-9_ ]*[ *](Mp?_[A-Za-z0-9_]+)(\[[0-9]+\])?;.*/\1/p' "$@"
 }
@@ -24,8 +25,16 @@ declared_cxx() {
   declared "$source"/src/pkg/M/indep/Mp_*.h | sed 's/$/@@M_PRIVATE/'
   declared_cxx | sed 's/$/@@M_1/'
 } | sort >"$work/declared"
+# Instances of templates over iterators, whose names are the standard library's: how many of each.
+declared_templates() {
+  printf '%s\n' '6 bool M_IsConvex' '8 void M_ComputeConvexHull'
+}
+
 nm -DC --defined-only --with-symbol-versions "$library" | sed -E 's/^[0-9a-f]* //' |
-  sed -n 's/^[^A] //p' | sort >"$work/exported"
+  sed -n 's/^[^A] //p' | sort -u >"$work/all"
+grep -v 'M_IsConvex\|M_ComputeConvexHull' "$work/all" >"$work/exported"
+grep -o '^[a-z]* M_IsConvex\|^[a-z]* M_ComputeConvexHull' "$work/all" | uniq -c | sed 's/^ *//' >"$work/templates"
+declared_templates | diff - "$work/templates" || { echo "< declared, > exported"; exit 1; }
 
 [ "$(wc -l <"$work/declared")" -gt 60 ] || { echo "the headers could not be read"; exit 1; }
 diff "$work/declared" "$work/exported" || { echo "< declared, > exported"; exit 1; }

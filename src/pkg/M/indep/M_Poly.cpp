@@ -1,0 +1,205 @@
+// Point in polygon, the area of a polygon, and quads seen edge-on.
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <cstring>
+#include <exception>
+#include <memory>
+
+#include "M_Matrix.h"
+#include "M_Rect.h"
+#include "Mp_Tolerance.h"
+#include "Mp_Vector3.h"
+#include "U.h"
+
+namespace {
+
+using Vector2 = M_Vector2T<double>;
+using Vector3 = M_Vector3T<double>;
+
+template <class Point>
+bool IsSameBitwise(const Point& a, const Point& b) {
+  return std::memcmp(&a, &b, sizeof a) == 0;
+}
+
+template <class Point>
+Vector2 Widen(const Point& p) {
+  return {p.x, p.y};
+}
+
+double SquaredDistance(const Vector2& a, const Vector2& b) {
+  const double dx = a.x - b.x;
+  const double dy = a.y - b.y;
+  return dx * dx + dy * dy;
+}
+
+// The tolerance's test of an edge: whether the point is near the edge, or near one of its ends.
+bool IsNearEdge(const Vector2& p, const Vector2& a, const Vector2& b, double squaredTolerance) {
+  const double length = std::sqrt(SquaredDistance(b, a));
+  const double r = length > Mp::kTolerance ? 1.0 / length : 0;
+  // Unless the edge is too short, or so long that nothing is left of its reciprocal.
+  if (!Mp::IsNearZero(r)) {
+    const Vector2 u = {(b.x - a.x) / length, (b.y - a.y) / length};
+    const Vector2 v = {p.x - a.x, p.y - a.y};
+    const double t = v.x * u.x + v.y * u.y;
+    const bool isBeside = t >= 0 && std::sqrt(v.x * v.x + v.y * v.y) <= length;
+    const Vector2 foot = {t * u.x, t * u.y};
+    if (isBeside && squaredTolerance >= SquaredDistance(v, foot)) return true;
+  }
+  return squaredTolerance >= SquaredDistance(p, a) || squaredTolerance >= SquaredDistance(p, b);
+}
+
+// Half-open, so that a vertex belongs to one of its edges, and an upright edge to nobody.
+template <class Coord>
+bool Straddles(Coord a, Coord b, Coord x) {
+  return ((a < x) & (x <= b)) | ((b < x) & (x <= a));
+}
+
+// The edges of a polygon, edge i from point i to the next, that straddle x; returns how many. Most
+// do not, and are passed over a block at a time.
+template <class Point>
+int32_t FindStraddling(const Point* poly, int32_t count, decltype(Point::x) x, int32_t* edges) {
+  constexpr int32_t kBlock = 16;
+  int32_t found = 0;
+  const auto look = [&](int32_t i, int32_t next) {
+    if (Straddles(poly[i].x, poly[next].x, x)) edges[found++] = i;
+  };
+  int32_t i = 0;
+  for (; i < count - kBlock; i += kBlock) {
+    int isAny = 0;
+    for (int32_t j = i; j < i + kBlock; ++j) isAny |= Straddles(poly[j].x, poly[j + 1].x, x);
+    if (!isAny) continue;
+    for (int32_t j = i; j < i + kBlock; ++j) look(j, j + 1);
+  }
+  for (; i < count - 1; ++i) look(i, i + 1);
+  look(count - 1, 0);
+  return found;
+}
+
+// A point that all points of the polygon coincide with.
+bool IsAtPoint(const Vector2& p, const Vector2& q, double squaredTolerance) {
+  return squaredTolerance > 0 ? squaredTolerance >= SquaredDistance(p, q)
+                              : p.x == q.x && p.y == q.y;
+}
+
+bool IsAtPoint(const M_Vector2T<float>& p, const M_Vector2T<float>& q, double squaredTolerance) {
+  const float dx = p.x - q.x;
+  const float dy = p.y - q.y;
+  return squaredTolerance > 0 ? squaredTolerance >= dx * dx + dy * dy : p.x == q.x && p.y == q.y;
+}
+
+// Points that repeat the one before are no corners, and the edges between them no edges: such an
+// edge straddles nothing and has no ends of its own. So the polygon is taken as it is, unless it is
+// a single point.
+template <class Point>
+bool IsInside(const Point& p, const Point* poly, int32_t count, double squaredTolerance) {
+  constexpr int32_t kOnStack = 64;
+  std::array<int32_t, kOnStack> few;
+  std::unique_ptr<int32_t[]> many;
+  if (count > kOnStack) many.reset(new int32_t[static_cast<size_t>(count)]);
+  int32_t* const edges = many ? many.get() : few.data();
+
+  const auto isFirst = [&](const Point& q) { return IsSameBitwise(q, poly[0]); };
+  if (std::all_of(poly + 1, poly + count, isFirst)) {
+    return IsAtPoint(p, poly[0], squaredTolerance);
+  }
+  const Vector2 wide = Widen(p);
+  const auto next = [&](int32_t i) { return Widen(poly[i + 1 < count ? i + 1 : 0]); };
+  if (squaredTolerance > 0) {
+    for (int32_t i = 0; i < count; ++i) {
+      if (IsNearEdge(wide, Widen(poly[i]), next(i), squaredTolerance)) return true;
+    }
+  }
+
+  const int32_t found = FindStraddling(poly, count, p.x, edges);
+  bool isOdd = false;
+  for (int32_t i = 0; i < found; ++i) {
+    const Vector2 a = Widen(poly[edges[i]]);
+    const Vector2 b = next(edges[i]);
+    const double y = (wide.x - b.x) / (a.x - b.x) * (a.y - b.y) + b.y;
+    if (Mp::IsNearlyEqual(y, wide.y)) return true;
+    if (y > wide.y) isOdd = !isOdd;
+  }
+  return isOdd;
+}
+
+// Twice the signed area of a triangle, or of a quadrilateral by its diagonals.
+double Cross(const Vector2& from1, const Vector2& to1, const Vector2& from2, const Vector2& to2) {
+  return (to1.x - from1.x) * (to2.y - from2.y) - (to1.y - from1.y) * (to2.x - from2.x);
+}
+
+}  // namespace
+
+// A template is exported where it is defined.
+#pragma GCC visibility push(default)
+
+template <class Point>
+int32_t M_IsFloatPointInConcavePoly(const Point* point, const Point* poly, int32_t count,
+                                    double tolerance, unsigned char* inside) {
+  *inside = 0;
+  if (count < 1) return 0;
+  try {
+    *inside = IsInside(*point, poly, count, tolerance * tolerance);
+    return 0;
+  } catch (const std::exception& thrown) {
+    return U_TranslateAndReportException(thrown);
+  } catch (int code) {
+    return code;
+  }
+}
+
+template int32_t M_IsFloatPointInConcavePoly(const M_Vector2T<double>*, const M_Vector2T<double>*,
+                                             int32_t, double, unsigned char*);
+template int32_t M_IsFloatPointInConcavePoly(const M_Vector2T<float>*, const M_Vector2T<float>*,
+                                             int32_t, double, unsigned char*);
+
+#pragma GCC visibility pop
+
+extern "C" {
+
+int32_t M_IsFloatPointInQuad(const M_Vector2T<double>* point, const M_Vector2T<double>* quad,
+                             unsigned char* inside) {
+  return M_IsFloatPointInConcavePoly(point, quad, 4, 0.0, inside);
+}
+
+double M_SignedPolygonArea2D(const M_Vector2T<double>* poly, int32_t count) {
+  if (count < 3) return 0.0;
+  if (count == 3) return 0.5 * Cross(poly[0], poly[1], poly[1], poly[2]);
+  if (count == 4) return 0.5 * Cross(poly[0], poly[2], poly[1], poly[3]);
+  // Quadrilaterals with a corner in point 0, and a triangle for an odd one.
+  double sum = 0;
+  for (int32_t i = 1; i < count / 2; ++i) {
+    sum += Cross(poly[0], poly[2 * i], poly[2 * i - 1], poly[2 * i + 1]);
+  }
+  if (count % 2 != 0) sum += Cross(poly[0], poly[count - 2], poly[count - 2], poly[count - 1]);
+  return sum * 0.5;
+}
+
+int32_t M_IsQuadEdgeOn(const M_Matrix4* matrix, const M_Vector3T<double>* corners,
+                       unsigned char useZAxis, unsigned char* isEdgeOn, double tolerance) {
+  *isEdgeOn = 0;
+  M_Vector4T<double> points[4];
+  Vector3 flat[4];
+  for (int i = 0; i < 4; ++i) points[i] = {corners[i].x, corners[i].y, corners[i].z, 1};
+  if (const int32_t code = M_TransformVector4(matrix, 4, points)) return code;
+  for (int i = 0; i < 4; ++i) flat[i] = {points[i].x, points[i].y, points[i].z};
+
+  M_PlaneEq plane;
+  M_GetPlaneEquation(flat, 4, &plane, nullptr);
+  const Vector3 normal = {plane.a, plane.b, plane.c};
+  const double length = Mp::Length(normal);
+  // From the eye at the origin to the middle of the quad.
+  Vector3 view = {0, 0, 1};
+  if (useZAxis == 0) {
+    const Vector3 sum = Mp::Sum(Mp::Sum(Mp::Sum(flat[0], flat[1]), flat[2]), flat[3]);
+    view = Mp::Divided(sum, 4);
+  }
+  const double distance = Mp::Length(view);
+  if (!(length > Mp::kTolerance) || !(distance > Mp::kTolerance)) return 0;
+  const double cosine = Mp::Dot(Mp::Divided(normal, length), Mp::Divided(view, distance));
+  *isEdgeOn = -tolerance < cosine && cosine < tolerance;
+  return 0;
+}
+
+}  // extern "C"
