@@ -32,8 +32,8 @@ class CasesTest : public HostTest, public ::testing::WithParamInterface<const ch
 INSTANTIATE_TEST_SUITE_P(, CasesTest,
                          ::testing::Values("approximation", "bits", "clip", "fixed", "life",
                                            "lines", "matrix3", "matrix4", "members", "points",
-                                           "ratio", "rectangles", "report", "rotations", "rounding",
-                                           "tables", "transforms"),
+                                           "polygons", "quads", "ratio", "rectangles", "report",
+                                           "rotations", "rounding", "tables", "transforms"),
                          [](const auto& file) { return std::string(file.param); });
 
 TEST_P(CasesTest, GiveTheirResults) {

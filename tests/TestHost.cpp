@@ -4,6 +4,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <new>
 
 #include "Mp_Strs.h"
 #include "U.h"
@@ -33,6 +34,15 @@ U_Handle Allocate(size_t bytes) {
 }
 
 }  // namespace
+
+void* operator new(size_t bytes) {
+  ++host.news;
+  void* const block = std::exchange(host.failsNextNew, false) ? nullptr : std::malloc(bytes);
+  if (!block) throw std::bad_alloc();
+  return block;
+}
+void operator delete(void* block) noexcept { std::free(block); }
+void operator delete(void* block, size_t) noexcept { std::free(block); }
 
 extern "C" {
 
