@@ -467,9 +467,10 @@ int32_t M_IsQuadEdgeOn(const M_Matrix4* matrix, const M_Vector3T<double>* corner
 
 /// *result = the part of the subject inside the clipper, which must be convex and may run either
 /// way round. Points within 1e-6 of a side, in the measure of its cross product, count as outside.
-/// New points have z and w between those of their neighbours. An empty clipper clips nothing; fewer
-/// than three points of a subject are nothing. The result may be one of the others; it is what it
-/// was if an allocation fails, which throws.
+/// z and w of a new point are interpolated, or where both neighbours are that close to the side
+/// extrapolated, between theirs. An empty clipper clips nothing; fewer than three points of a
+/// subject are nothing. The result may be one of the others; it is what it was if an allocation
+/// fails, which throws.
 void M_PolyPolyClip2D(const std::vector<M_Vector4T<double>>* clipper,
                       const std::vector<M_Vector4T<double>>* subject,
                       std::vector<M_Vector4T<double>>* result);
@@ -482,14 +483,15 @@ bool M_TransformPoint2DtoScreen(const M_Matrix3& first, const M_Matrix3& second,
 
 /// *inside = whether the point lies in the polygon, for points of double and of float:
 ///
-///   inside or nearly on an edge that is not upright     1
-///   within `tolerance` of an edge or a corner           1 (a tolerance of 0 is not asked for)
+///   inside                                              1
+///   nearly on an edge that is not upright               1 (but 0 on a corner that is the leftmost)
 ///   on an upright edge, on the side of larger x         1
 ///   on an upright edge, on the side of smaller x        0
 ///
-/// A polygon whose points are all the same is that point. A count below 1 gives 0. Returns 0, or
-/// what the host answers to an exception when there is no memory for more than 64 points, with
-/// *inside 0.
+/// With a tolerance (its sign does not matter) also what lies that close to a corner, or to an edge
+/// in the sense of M_PerpDistTo2DLine. A polygon whose points are all the same is that point. A
+/// count below 1 gives 0. Returns 0, or what the host answers to an exception when there is no
+/// memory for more than 64 points, with *inside 0.
 template <class Point>
 int32_t M_IsFloatPointInConcavePoly(const Point* point, const Point* poly, int32_t count,
                                     double tolerance, unsigned char* inside);
@@ -573,7 +575,8 @@ bool M_TransformPoint3DtoScreen(const M_Matrix4& toEye, const M_Matrix4& project
 // of M_Vector2T, M_Vector3T or M_Vector4T of double, and for hulls of qelcore::geom::PointT<float>.
 // ---------------------------------------------------------------------------------------------
 
-/// A point on the lattice of hulls: 0 to 2^29 in each direction.
+/// A point on the lattice of hulls: from 0 to 2^29 in each direction, or a little more where the
+/// steps are the smallest numbers there are.
 struct M_LongPoint {
   int32_t x;
   int32_t y;
@@ -590,8 +593,8 @@ bool M_IsConvex(Iterator first, Iterator last);
 /// The points are first moved to the nearest of 2^29 steps along each axis of their bounding box,
 /// and the corners are where they were moved to; other components are 0. Up to three points are
 /// copied as they are. Points on one line give the lowest, the farthest from it and the next
-/// farthest. A NaN counts as the least coordinate, unless all are; beside an infinity the corners'
-/// coordinates are NaNs. `out` may hold the points.
+/// farthest. A NaN counts as the least coordinate of its axis; where an axis has no finite extent,
+/// the corners' coordinates on it are no finite numbers. `out` may hold the points.
 template <class Iterator>
 void M_ComputeConvexHull(Iterator first, Iterator last,
                          std::vector<typename std::iterator_traits<Iterator>::value_type>& out);

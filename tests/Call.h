@@ -55,7 +55,7 @@ class Slot {
       return NearElements(wide, 1e4);
     } else if constexpr (std::is_integral_v<Value>) {
       return std::to_string(value);
-    } else if constexpr (IsPoint<Value> || IsRect<Value>) {
+    } else if constexpr (IsPoint<Value> || IsRect<Value> || std::is_same_v<Value, M_WHRect>) {
       return ToText(value);
     } else {
       return kOptions.isNear ? NearElements(value) : Elements(value);

@@ -47,6 +47,7 @@ template <IsRect Rect>
 std::string ToText(const Rect& r) {
   return ToText(M_LPoint{r.left, r.top}).append(",").append(ToText(M_LPoint{r.right, r.bottom}));
 }
+inline std::string ToText(const M_WHRect& r) { return List(r.values); }
 inline std::string ToText(const M_FloatRect& r) {
   return List(std::array{r.left, r.top, r.right, r.bottom});
 }
@@ -88,6 +89,8 @@ Record Read(Arguments& in) {
   if constexpr (IsPoint<Record>) {
     record.h = static_cast<decltype(record.h)>(numbers.at(0));
     record.v = static_cast<decltype(record.v)>(numbers.at(1));
+  } else if constexpr (std::is_same_v<Record, M_WHRect>) {
+    for (size_t i = 0; i < 4; ++i) record.values[i] = static_cast<int16_t>(numbers.at(i));
   } else if constexpr (IsRect<Record>) {
     record.left = static_cast<decltype(record.left)>(numbers.at(0));
     record.top = static_cast<decltype(record.top)>(numbers.at(1));

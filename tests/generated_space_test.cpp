@@ -213,18 +213,6 @@ TEST_F(Space, RectanglesAreTheCellsTheyCover) {
   }
 }
 
-TEST_F(Space, WHRectsKeepTheirValues) {
-  M_WHRect a, b = {};
-  EXPECT_EQ(M_SetWHRect(&a, 4, -3, 2, 1) | M_CopyWHRect(&a, &b), 0);
-  EXPECT_TRUE(b.values[0] == 4 && b.values[1] == -3 && b.values[2] == 2 && b.values[3] == 1);
-  EXPECT_EQ(M_EqualWHRect(&a, &b), 1);
-  for (int16_t& value : b.values) {
-    value ^= 1;
-    EXPECT_EQ(M_EqualWHRect(&a, &b), 0);
-    value ^= 1;
-  }
-}
-
 // What holds exactly for whole numbers.
 TEST_F(Space, ConcatenationIsOneTransformAfterTheOther) {
   for (int round = 0; round < 300; ++round) {
@@ -311,17 +299,6 @@ TEST_F(Space, RotationsAreThoseOfThePlatform) {
   EXPECT_NEAR(points[0].y, 0, 1e-14);
   EXPECT_NEAR(points[1].x, 10, 1e-14);
   EXPECT_NEAR(points[1].y, 1, 1e-14);
-}
-
-TEST_F(Space, ZeroAndIdentity) {
-  M_Matrix4 m = Random<M_Matrix4>(&Space::Uniform);
-  EXPECT_EQ(M_ZeroMatrix4(&m), 0);
-  EXPECT_TRUE(m.IsZeroWithinEpsilon(0));
-  EXPECT_EQ(M_IdentityMatrix4(&m), 0);
-  EXPECT_TRUE(m.IsIdentityWithinEpsilon(0));
-  M_Matrix3 m3 = Random<M_Matrix3>(&Space::Uniform);
-  EXPECT_EQ(M_SetIdentityMatrix(&m3), 0);
-  EXPECT_TRUE(m3.IsIdentityWithinEpsilon(0));
 }
 
 }  // namespace

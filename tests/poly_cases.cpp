@@ -71,7 +71,7 @@ std::string Clip(Arguments& in) {
   }
   polygons[2] = {{9, 9, 9, 9}};
   std::string text;
-  for (const size_t place : {2, 1, 0}) {
+  for (const size_t place : {size_t{2}, size_t{1}, size_t{0}}) {
     auto all = polygons;
     M_PolyPolyClip2D(&all[0], &all[1], &all[place]);
     const std::string result = TextOfAll(all[place]);
@@ -177,7 +177,8 @@ const Operation kCrossings("Crossings", [](Arguments&) { return TextOfAll(quad->
 
 const Operation kInvalidate("Invalidate", [](Arguments&) {
   quad->InvalidatePolyPoints();
-  return Text(quad->polyPoints.size(), quad->polyPoints.capacity(), quad->polyPointsValid);
+  return Text(quad->NumPolyPoints(), static_cast<int>(quad->polyPoints.capacity()),
+              quad->polyPointsValid);
 });
 
 const Operation kInit("InitPolyPoints", [](Arguments&) {

@@ -2,19 +2,12 @@
 
 #include <cctype>
 
-#include "Cases.h"
+#include "Call.h"
 #include "Mp_Bits.h"
 #include "Mp_Ratio.h"
 #include "Mp_Utils.h"
 
 namespace {
-
-template <auto kOperation>
-std::string Integers(Arguments& in) {
-  const int32_t a = in.Int();
-  const int32_t result = kOperation(a, in.Int());
-  return Text(result).append(Outcome(0));
-}
 
 template <auto kOperation>
 std::string Arithmetic(Arguments& in) {
@@ -115,11 +108,6 @@ std::string FromDouble(Arguments& in) {
   return Text(best).append(isOutOfRange ? " out of range" : "").append(Outcome(code));
 }
 
-std::string Round(Arguments& in) {
-  const double d = in.Double();
-  return Text(M_RoundDouble(d), M_RoundDoubleSafe(d), M_RoundDouble64(d));
-}
-
 std::string LongMultiply(Arguments& in) {
   const int32_t a = in.Int();
   int32_t out[2] = {};
@@ -129,43 +117,35 @@ std::string LongMultiply(Arguments& in) {
   return Text(out[0], out[1]).append(Outcome(code));
 }
 
-std::string Bits(Arguments& in) {
-  const uint32_t x = in.Unsigned();
-  return Text(M_LeadingZeros(x), M_TrailingZeros(x), M_RoundDownToPowerOf2(x),
-              M_RoundUpToPowerOf2(x), M_BitsUsed(static_cast<int32_t>(x)), M_IsTopTwoBitsSame(x));
-}
-
-std::string Overflow(Arguments& in) {
-  const int32_t a = in.Int(), b = in.Int();
-  return Text(M_AddWouldOverflow(a, b), M_MulWouldOverflow(a, b),
-              M_UMulWouldOverflow(static_cast<uint32_t>(a), static_cast<uint32_t>(b)));
-}
-
-std::string GcdAndLcm(Arguments& in) {
-  const int32_t a = in.Int(), b = in.Int();
-  const auto ua = static_cast<uint32_t>(a), ub = static_cast<uint32_t>(b);
-  int32_t gcd = 99, lcm = 99;
-  uint32_t ugcd = 99, ulcm = 99;
-  const int32_t code = M_SignedGCD(a, b, &gcd) | M_SignedLCM(a, b, &lcm) |
-                       M_UnsignedGCD(ua, ub, &ugcd) | M_UnsignedLCM(ua, ub, &ulcm);
-  return Text(gcd, lcm, ugcd, ulcm).append(Outcome(code));
-}
-
 const Operation kOperations[] = {
     {"AddRatio", Arithmetic<M_AddRatio>},
-    {"Bits", Bits},
+    {"AddWouldOverflow", Call<M_AddWouldOverflow>},
+    {"BitsUsed", Call<M_BitsUsed>},
+    {"IsTopTwoBitsSame", Call<M_IsTopTwoBitsSame>},
+    {"LeadingZeros", Call<M_LeadingZeros>},
+    {"MulWouldOverflow", Call<M_MulWouldOverflow>},
+    {"RoundDouble", Call<M_RoundDouble>},
+    {"RoundDouble64", Call<M_RoundDouble64>},
+    {"RoundDoubleSafe", Call<M_RoundDoubleSafe>},
+    {"RoundDownToPowerOf2", Call<M_RoundDownToPowerOf2>},
+    {"RoundUpToPowerOf2", Call<M_RoundUpToPowerOf2>},
+    {"SignedGCD", Call<M_SignedGCD>},
+    {"SignedLCM", Call<M_SignedLCM>},
+    {"TrailingZeros", Call<M_TrailingZeros>},
+    {"UMulWouldOverflow", Call<M_UMulWouldOverflow>},
+    {"UnsignedGCD", Call<M_UnsignedGCD>},
+    {"UnsignedLCM", Call<M_UnsignedLCM>},
     {"ClipRatio", Clip<M_ClipRatio>},
     {"ClipRatioToSpan", Clip<M_ClipRatioToSpan>},
     {"ClipSpanToSpan", ClipSpan},
     {"CompareRatio", Compare},
     {"ConvRatio", Convert},
     {"DivRatio", Arithmetic<M_DivRatio>},
-    {"Fix24Mul", Integers<M_Fix24Mul>},
-    {"Fix24Ratio", Integers<M_Fix24Ratio>},
-    {"FixDiv", Integers<M_FixDiv>},
-    {"FixMul", Integers<M_FixMul>},
+    {"Fix24Mul", Call<M_Fix24Mul>},
+    {"Fix24Ratio", Call<M_Fix24Ratio>},
+    {"FixDiv", Call<M_FixDiv>},
+    {"FixMul", Call<M_FixMul>},
     {"FpLong2Ratio", FromDouble},
-    {"GcdAndLcm", GcdAndLcm},
     {"LongMul", LongMultiply},
     {"Nibble",
      [](Arguments& in) {
@@ -173,18 +153,12 @@ const Operation kOperations[] = {
        return Text(Mp_G_lead_zeros[nibble], Mp_G_trail_zeros[nibble]);
      }},
     {"MulRatio", Arithmetic<M_MulRatio>},
-    {"Overflow", Overflow},
     {"RecipRatio", Unary<M_RecipRatio>},
     {"ReduceRatio", Unary<M_ReduceRatio>},
-    {"RoundDouble", Round},
-    {"RoundToNearestMult", Integers<M_RoundToNearestMult>},
+    {"RoundToNearestMult", Call<M_RoundToNearestMult>},
     {"ShortConvRatio", ShortConvert},
     {"SubRatio", Arithmetic<M_SubRatio>},
-    {"fmod",
-     [](Arguments& in) {
-       const double x = in.Double();
-       return Text(static_cast<int64_t>(M_fmod(x, in.Double()) * 1000));
-     }},
+    {"fmod", Call<M_fmod>},
 };
 
 }  // namespace

@@ -58,11 +58,13 @@ class Axis {
     if (!(step_ > 0)) step_ = 1;
   }
 
-  // A NaN, and what stands beside an infinity, goes to 0.
+  // A NaN, and what stands beside an infinity, goes to 0. Beyond 2^29 comes what is counted in the
+  // smallest steps there are, which may be too short by a third.
   int32_t ToLattice(double coordinate) const {
+    constexpr double kMost = 0x1p30 - 1;
     const double steps = (coordinate - least_) / step_ + 0.5;
     if (!(steps >= 0)) return 0;
-    return static_cast<int32_t>(std::min(steps, 0x1p29));
+    return static_cast<int32_t>(std::min(steps, kMost));
   }
 
   double FromLattice(int32_t coordinate) const { return coordinate * step_ + least_; }
@@ -92,6 +94,10 @@ class Interior {
     for (size_t i = 0; i < count; ++i) Include(sample[i], &box_);
     const double width = box_.right - box_.left;
     const double height = box_.bottom - box_.top;
+    // Where products could overflow or vanish, nothing is inside. A NaN fails, too.
+    const auto isModest = [](double number) { return number > 1e-100 && number < 1e100; };
+    const bool canTell = isModest(width) && isModest(height) &&
+                         isModest(1 + std::abs(box_.left) + std::abs(box_.top));
     std::array<double, 8> farthest;
     farthest.fill(-kInfinity);
     std::array<Point, 8> corners = {};
@@ -118,9 +124,17 @@ class Interior {
       const Point& q = corners[(k + 1) % 8];
       const double dx = q.x - p.x;
       const double dy = q.y - p.y;
-      sides_[k] = {p, dx, dy, std::abs(dx) * marginY + std::abs(dy) * marginX};
-      // A side without length says nothing, unless there is nothing but such sides.
-      if (dx == 0 && dy == 0) sides_[k].margin = width > 0 && height > 0 ? -1 : kInfinity;
+      // A side without length says nothing; of one that is very short nothing can be said.
+      const bool isPoint = dx == 0 && dy == 0;
+      const bool isLong = std::abs(dx) > width * 0x1p-20 || std::abs(dy) > height * 0x1p-20;
+      sides_[k] = {p, dx, dy,
+                   isPoint  ? -1
+                   : isLong ? std::abs(dx) * marginY + std::abs(dy) * marginX
+                            : kInfinity};
+    }
+    if (!canTell) {
+      rectangle_ = kNothing;
+      sides_[0].margin = kInfinity;
     }
   }
 
@@ -198,7 +212,7 @@ bool IsLeftOf(const M_LongPoint& a, const M_LongPoint& b) {
 void SortByX(M_LongPoint* points, size_t count, M_LongPoint* scratch) {
   constexpr int kBits = 10;
   constexpr size_t kDigits = size_t{1} << kBits;
-  // Coordinates reach 2^29: three digits.
+  // Coordinates are below 2^30: three digits.
   std::array<std::array<size_t, kDigits>, 3> starts = {};
   for (size_t i = 0; i < count; ++i) {
     const auto x = static_cast<uint32_t>(points[i].x);
