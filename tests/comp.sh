@@ -37,6 +37,13 @@ says() {
 says 's/24/"30000\/1001"/; s/48/2147483647/' '^  in  .* ~0$'
 says 's/24/"30000\/1001"/; s/"start": 0/"start": 2147483647/' '^  in  .* 0  *~[0-9]*$'
 says 's/24/"30000\/1001"/; s/"start": 0/"start": 2147483647/' 'multiply\.$'
+says 's/24/24, "size": [100, 100]/; s/"in": 0/"in": 0, "size": [400, 40], "position": [60, 50, -100], "orientation": {"angles": [0, 90, 0]}/' '^  cut at  *(10, -20, 0.1) (10, 20, 0.1)$'
+says 's/24/24, "size": [9, 9], "camera": {"eye": [1, 2, 3], "target": [4, 6, 15], "up": [3, 1, -2]}/; s/"in": 0/"in": 0, "size": [1, 1], "position": [1, 2, 3]/' '^  from the eye (-0.232, 0.611, -0.269) (-0.654, -0.265, -0.038)'
+says 's/24/24, "size": [9, 9]/; s/"in": 0/"in": 0, "size": [2, 3], "anchor": [0, 0], "position": [0, 0], "scale": [2, 3]/' 'placed by scale$'
+says 's/24/24, "size": [9, 9]/; s/"in": 0/"in": 0, "size": [4, 4], "position": [-9, -9]/; s/{"name": "L".*}\]/&/; 2s/ *\({.*}\)\]/\1, \1]/' '^  over "L"  *-11,-11 to -7,-7$'
+says 's/24/24, "size": [9, 9]/; s/"in": 0/"in": 0, "size": [1, 1], "position": [1, 2, 3], "keys": [{"frame": 0, "quaternion": [0, 0, 0, 2]}, {"frame": 4, "quaternion": [0, 0, 1, 0]}]/' '^  frame 2     (0, 0, 53.13)$'
+says 's/24/24, "size": [30000, 1]/' '^Frame 30000 x 1,'
+says 's/24/24, "size": [16, 9]/; s/"in": 0/"in": 0, "size": [1, 1], "position": [1, 2, 3]/' '^Space, seen from (8, 4.5, -16) towards (8, 4.5, 0), zoom 16$'
 says '1s/$/]}/; 2d' '^Sum of the durations: 0 s, exact$'
 
 # What cannot be used: exit status 2, one sentence, nothing printed.

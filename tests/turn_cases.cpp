@@ -1,5 +1,7 @@
 // Decomposition, rotations, quaternions, planes and lines.
 
+#include <numbers>
+
 #include "Call.h"
 #include "Mp_Decomp.h"
 
@@ -31,6 +33,9 @@ std::string Decompose(Arguments& in) {
   EXPECT_EQ(Elements(angles), Elements(xyz.rotate));
   const V3 zyxAngles = std::exchange(zyx.rotate, xyz.rotate);
   EXPECT_EQ(Elements(zyx), Elements(xyz));
+  if (zyxAngles.z > 3.1415926) {
+    EXPECT_EQ(zyxAngles.z, std::numbers::pi);
+  }
   return Text(NearElements(xyz.translate), NearElements(xyz.scale), NearElements(xyz.shear),
               NearElements(xyz.rotate), NearElements(zyxAngles))
       .append(outcome);

@@ -27,8 +27,7 @@ PlacedLayer Place(const Layer& layer, const Size& frame) {
   M_Matrix3ToMatrix4(&m, &inverse);
   placed.isInvertible = M_InverseMatrix4(&inverse, &inverse) == 0;
   const M_LRect own = ToRect(placed.size);
-  M_FloatRect rect = {0, 0, static_cast<double>(own.right), static_cast<double>(own.bottom)};
-  M_TransformFloatRect(&m, &rect, placed.corners.data(), nullptr);
+  placed.corners = CornersOf(*layer.placement);
   placed.bounds = M_TransformBounds(m, own);
   const M_LRect whole = ToRect(frame);
   M_SectLRect(&placed.bounds, &whole, &placed.inFrame);
@@ -36,6 +35,15 @@ PlacedLayer Place(const Layer& layer, const Size& frame) {
 }
 
 }  // namespace
+
+std::array<M_Vector2T<double>, 4> CornersOf(const Placement& placement) {
+  const M_Matrix3 m = MakeMatrix(placement);
+  std::array<M_Vector2T<double>, 4> corners;
+  M_FloatRect rect = {0, 0, static_cast<double>(placement.size.width),
+                      static_cast<double>(placement.size.height)};
+  M_TransformFloatRect(&m, &rect, corners.data(), nullptr);
+  return corners;
+}
 
 std::optional<Layout> MakeLayout(const Composition& composition, ReportCollector& collector) {
   if (!composition.size) return {};

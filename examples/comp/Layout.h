@@ -38,6 +38,9 @@ struct Layout {
   M_LRect all;                      ///< Encloses every layer.
 };
 
+/// Where a layer's corners lie in the frame: left top, right top, right bottom, left bottom.
+std::array<M_Vector2T<double>, 4> CornersOf(const Placement& placement);
+
 /// Nothing for a composition without a size.
 std::optional<Layout> MakeLayout(const Composition& composition, ReportCollector& collector);
 

@@ -77,16 +77,8 @@ SpaceLayer Place(const Layer& layer, const M_Matrix4& view) {
   placed.name = layer.name;
   placed.size = placement.size;
   placed.samples = SampleAll(placement.keys);
-  const Orientation& orientation =
-      placement.keys.empty() ? placement.orientation : placement.keys.front().orientation;
-
-  M_Matrix4& m = placed.matrix;
-  const M_Matrix4 rotation = ToMatrix(orientation);
-  M_IdentityMatrix4(&m);
-  M_TranslateMatrix4(&m, -placement.anchor.x, -placement.anchor.y, -placement.anchor.z);
-  M_ScaleMatrix4(&m, placement.scale.x, placement.scale.y, placement.scale.z);
-  M_ConcatMatrix4(&m, &rotation, &m);
-  M_TranslateMatrix4(&m, placement.position.x, placement.position.y, placement.position.z);
+  placed.matrix = WorldMatrix(placement, {});
+  const M_Matrix4& m = placed.matrix;
 
   placed.isDecomposable = M_DecomposeMatrix4(&m, &placed.decomp, nullptr) == 0;
   M_Matrix4Decomp zyx;
@@ -123,6 +115,23 @@ M_Matrix4 MakeView(const Camera& camera) {
 }
 
 }  // namespace
+
+M_Matrix4 WorldMatrix(const SpacePlacement& placement, std::optional<double> frame) {
+  M_Matrix4 m, rotation;
+  if (placement.keys.empty()) {
+    rotation = ToMatrix(placement.orientation);
+  } else if (frame) {
+    M_QuatToMatrix4(SampleAt(placement.keys, *frame).quaternion.data(), &rotation);
+  } else {
+    rotation = ToMatrix(placement.keys.front().orientation);
+  }
+  M_IdentityMatrix4(&m);
+  M_TranslateMatrix4(&m, -placement.anchor.x, -placement.anchor.y, -placement.anchor.z);
+  M_ScaleMatrix4(&m, placement.scale.x, placement.scale.y, placement.scale.z);
+  M_ConcatMatrix4(&m, &rotation, &m);
+  M_TranslateMatrix4(&m, placement.position.x, placement.position.y, placement.position.z);
+  return m;
+}
 
 Scene MakeScene(const Composition& composition, ReportCollector& collector) {
   Scene scene = {*composition.camera, MakeView(*composition.camera), {}};

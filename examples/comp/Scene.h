@@ -5,6 +5,7 @@
 
 #include <array>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -38,6 +39,9 @@ struct Scene {
   M_Matrix4 view;  ///< From the world to the eye.
   std::vector<SpaceLayer> layers;
 };
+
+/// From a layer to the world, at a frame or, without one, at the first key.
+M_Matrix4 WorldMatrix(const SpacePlacement& placement, std::optional<double> frame);
 
 /// The scene of a composition with a size.
 Scene MakeScene(const Composition& composition, ReportCollector& collector);

@@ -1,6 +1,9 @@
 // comp: prints the sheet of a composition file.
 
+#include <algorithm>
+#include <charconv>
 #include <clocale>
+#include <cmath>
 #include <cstdlib>
 #include <fstream>
 #include <iostream>
@@ -9,14 +12,17 @@
 
 #include "Composition.h"
 #include "M_Utils.h"
+#include "Picture.h"
 #include "SheetText.h"
 #include "U.h"
+#include "Wording.h"
 
 namespace {
 
 constexpr int kBadInput = 2;
 
 constexpr char kHelp[] = R"(Usage: comp [--json] FILE...
+       comp --svg OUT [--time FRAME] [--hit X,Y] [--tolerance D] [--grid N] FILE
 
 Prints the sheet of each composition file: its frame rate, start and duration,
 and for every layer its in and out points as exact ratios in seconds and as
@@ -28,6 +34,16 @@ moved, scaled, sheared and turned, and where the camera sees them.
 
   --json  prints the sheet as JSON
   --help  prints this text
+
+With --svg a composition with a size is drawn instead: the frame, the outline of
+every layer, filled from back to front, with a dashed line around its part in
+the frame, layers seen from the side as a line, and the hull of them all.
+
+  --time FRAME   as it is at a frame; else with every layer, at its first key
+  --hit X,Y      marks a point, and prints the layers under it from front to back
+                 with the distance of their nearest edge
+  --tolerance D  pixels by which a hit may be beside a layer
+  --grid N       draws N x N points in the colours of the layers they hit
 
 A composition file is a JSON object:
   name       text
@@ -80,44 +96,123 @@ std::string MakeSheets(const std::vector<std::string>& fileNames, bool asJson) {
   return text;
 }
 
+struct Arguments {
+  bool asJson = false;
+  std::string svg;  ///< The file to draw to, if any.
+  comp::PictureOptions picture;
+  std::vector<std::string> fileNames;
+};
+
+// One or more numbers with commas between them, and nothing else.
+std::vector<double> ParseNumbers(const std::string& option, const std::string& text, size_t count) {
+  std::vector<double> numbers;
+  const char* at = text.data();
+  const char* const end = at + text.size();
+  while (numbers.size() < count) {
+    double number;
+    const auto [rest, error] = std::from_chars(at, end, number);
+    if (error != std::errc() || !std::isfinite(number)) break;
+    numbers.push_back(number);
+    at = rest;
+    if (numbers.size() == count || at == end || *at != ',') break;
+    ++at;
+  }
+  if (numbers.size() != count || at != end) {
+    throw comp::InputError(option + " takes " + (count == 1 ? "a number" : "two numbers") +
+                           ", not " + text + ".");
+  }
+  return numbers;
+}
+
+Arguments ParseArguments(const std::vector<std::string>& words) {
+  Arguments arguments;
+  for (size_t i = 0; i < words.size(); ++i) {
+    const std::string& word = words[i];
+    const auto next = [&] {
+      if (++i == words.size()) throw comp::InputError(word + " is not followed by a value.");
+      return words[i];
+    };
+    const auto number = [&] { return ParseNumbers(word, next(), 1)[0]; };
+    if (word == "--json") {
+      arguments.asJson = true;
+    } else if (word == "--svg") {
+      arguments.svg = next();
+    } else if (word == "--time") {
+      arguments.picture.frame = number();
+    } else if (word == "--hit") {
+      const auto numbers = ParseNumbers(word, next(), 2);
+      arguments.picture.point = {numbers[0], numbers[1]};
+    } else if (word == "--tolerance") {
+      arguments.picture.tolerance = number();
+    } else if (word == "--grid") {
+      const double points = number();
+      if (!(points >= 1 && points <= 1000))
+        throw comp::InputError("--grid takes 1 to 1000 points.");
+      arguments.picture.grid = static_cast<int>(points);
+    } else if (word.starts_with("-")) {
+      throw comp::InputError(word + " is not an option; see comp --help.");
+    } else {
+      arguments.fileNames.push_back(word);
+    }
+  }
+  if (arguments.fileNames.empty()) throw comp::InputError("no file is given; see comp --help.");
+  if (!arguments.svg.empty() && arguments.fileNames.size() != 1) {
+    throw comp::InputError("--svg draws one file.");
+  }
+  return arguments;
+}
+
+// Draws to a file; returns what is to be printed.
+std::string MakePicture(const Arguments& arguments) {
+  const comp::Composition composition = ReadFile(arguments.fileNames[0]);
+  if (!composition.size) {
+    throw comp::InputError(arguments.fileNames[0] +
+                           ": composition has no \"size\" to be drawn in.");
+  }
+  const comp::Picture picture = comp::Draw(composition, arguments.picture);
+  std::ofstream file(arguments.svg);
+  if (!(file << picture.svg << std::flush)) {
+    throw std::ios_base::failure(arguments.svg + " cannot be written");
+  }
+  for (const comp::Report& report : picture.reports) {
+    std::cerr << "comp: layer \"" << report.layer << "\": " << report.text << '\n';
+  }
+  std::string text;
+  for (const comp::Hit& hit : picture.hits) {
+    text += hit.name + ", " + comp::ToText(hit.distance) + " from its nearest edge\n";
+  }
+  if (arguments.picture.point && text.empty()) text = "nothing\n";
+  return text;
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
   std::setlocale(LC_ALL, "");
-  bool asJson = false;
-  std::vector<std::string> fileNames;
-  for (int i = 1; i < argc; ++i) {
-    const std::string argument = argv[i];
-    if (argument == "--help") {
-      std::cout << kHelp;
-      return 0;
-    }
-    if (argument == "--json") {
-      asJson = true;
-    } else if (argument.starts_with("-")) {
-      std::cerr << "comp: " << argument << " is not an option; see comp --help.\n";
-      return kBadInput;
-    } else {
-      fileNames.push_back(argument);
-    }
+  const std::vector<std::string> words(argv + 1, argv + argc);
+  if (std::find(words.begin(), words.end(), "--help") != words.end()) {
+    std::cout << kHelp;
+    return 0;
   }
-  if (fileNames.empty()) {
-    std::cerr << "comp: no file is given; see comp --help.\n";
-    return kBadInput;
-  }
-
   // Birth and death are logged; a command line tool has no use for that.
   U_SetLogCallback([](void*, int32_t, const char*, const char*, const char*) {}, nullptr);
   if (M_Birth(0, nullptr) != 0) return EXIT_FAILURE;
   int status = 0;
   try {
-    if (!(std::cout << MakeSheets(fileNames, asJson) << std::flush)) {
+    const Arguments arguments = ParseArguments(words);
+    const std::string text = arguments.svg.empty()
+                                 ? MakeSheets(arguments.fileNames, arguments.asJson)
+                                 : MakePicture(arguments);
+    if (!(std::cout << text << std::flush)) {
       std::cerr << "comp: the output cannot be written.\n";
       status = EXIT_FAILURE;
     }
   } catch (const comp::InputError& error) {
     std::cerr << "comp: " << error.what() << '\n';
     status = kBadInput;
+  } catch (const std::ios_base::failure&) {
+    std::cerr << "comp: the picture cannot be written.\n";
+    status = EXIT_FAILURE;
   }
   M_Death();
   return status;

@@ -196,10 +196,9 @@ double M_VecToAngle(const M_Vector2T<double>& v) {
   } else if (v.y > 0) {
     a = -90;
   }
+  // From 270 to 630.
   const double bearing = 360 - a + 90;
-  if (bearing > 360) return bearing - 360;
-  if (bearing < 0) return bearing + 360;
-  return bearing;
+  return bearing > 360 ? bearing - 360 : bearing;
 }
 
 int32_t M_Pt2Angle(const M_FloatRect* rect, const M_Vector2T<double>* point, double* angle) {
@@ -216,8 +215,8 @@ int32_t M_Pt2Angle(const M_FloatRect* rect, const M_Vector2T<double>* point, dou
     a = -kQuarterTurn;
   }
   a = a / -kPi + 360 + 90;
-  while (a > 360) a -= 360;
-  while (a < 0) a += 360;
+  // From 270 to 630.
+  if (a > 360) a -= 360;
   *angle = a;
   return 0;
 }
