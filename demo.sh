@@ -1,5 +1,5 @@
 #!/bin/sh
-# Installs what is missing, builds, and prints the sheets of the sample compositions.
+# Installs what is missing, builds, and prints the sheets of the sample compositions and draws two.
 set -eu
 cd "$(dirname "$0")"
 . scripts/common.sh
@@ -9,3 +9,9 @@ build_preset release --target comp catalogues
 echo
 build/release/bin/comp examples/comp/samples/film.json examples/comp/samples/broadcast.json \
   examples/comp/samples/sound.json examples/comp/samples/stage.json examples/comp/samples/space.json
+
+for sample in stage space; do
+  build/release/bin/comp --svg build/$sample.svg --grid 24 examples/comp/samples/$sample.json 2>/dev/null
+done
+echo
+echo "Drawn: build/stage.svg, build/space.svg"

@@ -25,9 +25,25 @@ sheets --json | tr -d '\n' | perl -pe 's/ +/ /g; s/\{ "name"/\n$&/g;
 diff "$tests/comp_json.txt" "$work/json" || fail "< the JSON as it should be, > as it is"
 "$program" --help >"$work/help" && grep -q '^Usage: comp' "$work/help" || fail "--help does not help"
 
+# Pictures, with their numbers in whole pixels.
+draw() {
+  "$program" --svg "$work/picture" "$@" 2>/dev/null
+  perl -pe 's/-?\d+\.\d+/sprintf("%.0f", $&)/ge' "$work/picture"
+}
+{
+  draw --hit 960,540 --grid 8 "$samples/space.json"
+  draw --time 60 --hit 100,100 "$samples/space.json"
+  draw --hit 1279,100 --tolerance 2 "$samples/stage.json"
+  draw --hit 1290,100 --tolerance 2 "$samples/stage.json"
+} >"$work/pictures"
+diff "$tests/comp_pictures.txt" "$work/pictures" || fail "< the pictures as they should be, > as they are"
+
 status=0
 "$program" "$samples/film.json" >/dev/full 2>"$work/err" || status=$?
 [ "$status" = 1 ] && grep -q 'cannot be written' "$work/err" || fail "exit status $status where nothing can be written"
+status=0
+"$program" --svg "$work/no/picture" "$samples/stage.json" >"$work/out" 2>"$work/err" || status=$?
+[ "$status" = 1 ] && grep -q 'picture cannot be written' "$work/err" || fail "exit status $status where nothing can be drawn"
 
 # EDIT of the base file, what its sheet then says.
 says() {
@@ -60,6 +76,16 @@ expected: comp: $sentence"
 refuse "$work/none.json: cannot be read." "$work/none.json"
 refuse "no file is given; see comp --help."
 refuse "-f is not an option; see comp --help." -f "$samples/film.json"
+refuse "--svg is not followed by a value." "$samples/stage.json" --svg
+refuse "--svg draws one file." --svg "$work/picture" "$samples/stage.json" "$samples/space.json"
+refuse "$samples/film.json: composition has no \"size\" to be drawn in." --svg "$work/picture" "$samples/film.json"
+refuse "--hit takes two numbers, not 5." --hit 5 "$samples/stage.json"
+refuse "--hit takes two numbers, not 5,." --hit 5, "$samples/stage.json"
+refuse "--hit takes two numbers, not 5,6,7." --hit 5,6,7 "$samples/stage.json"
+refuse "--time takes a number, not 1x." --time 1x "$samples/stage.json"
+refuse "--time takes a number, not inf." --time inf "$samples/stage.json"
+refuse "--grid takes 1 to 1000 points." --grid 1001 "$samples/stage.json"
+refuse "--grid takes 1 to 1000 points." --grid 0 "$samples/stage.json"
 while IFS='|' read -r edit sentence; do
   sed "$edit" "$tests/comp_base.json" >"$work/bad.json"
   refuse "$work/bad.json: $sentence" "$samples/film.json" "$work/bad.json"
