@@ -103,7 +103,9 @@ M_Matrix4 M_LookAtMatrix(const M_Vector3T<double>& eye, const M_Vector3T<double>
     M_Matrix4 m = Mp::kIdentity4;
     if (distance == 0) return m;
     const double angle = f.y >= 0 ? -kQuarterTurn : kQuarterTurn;
-    if (const int code = M_RotateMatrix4(&m, S_axis.x, S_axis.y, S_axis.z, angle)) throw code;
+    if (const int32_t code = M_RotateMatrix4(&m, S_axis.x, S_axis.y, S_axis.z, angle)) {
+      throw int{code};
+    }
     return m;
   }
   return {{{s.x, s.y, s.z, 0}, {u.x, u.y, u.z, 0}, {f.x, f.y, f.z, 0}, {0, 0, 0, 1}}};

@@ -2,10 +2,12 @@
 
 #include <algorithm>
 #include <array>
+#include <bit>
 #include <cmath>
-#include <cstring>
+#include <cstdint>
 #include <exception>
 #include <memory>
+#include <type_traits>
 
 #include "M_Matrix.h"
 #include "M_Rect.h"
@@ -18,9 +20,12 @@ namespace {
 using Vector2 = M_Vector2T<double>;
 using Vector3 = M_Vector3T<double>;
 
+// Zeros of either sign differ, NaNs of the same bits do not.
 template <class Point>
 bool IsSameBitwise(const Point& a, const Point& b) {
-  return std::memcmp(&a, &b, sizeof a) == 0;
+  using Word = std::conditional_t<sizeof(Point) == 16, uint64_t, uint32_t>;
+  using Words = std::array<Word, 2>;
+  return std::bit_cast<Words>(a) == std::bit_cast<Words>(b);
 }
 
 template <class Point>
@@ -169,8 +174,8 @@ double M_SignedPolygonArea2D(const M_Vector2T<double>* poly, int32_t count) {
   if (count == 4) return 0.5 * Cross(poly[0], poly[2], poly[1], poly[3]);
   // Quadrilaterals with a corner in point 0, and a triangle for an odd one.
   double sum = 0;
-  for (int32_t i = 1; i < count / 2; ++i) {
-    sum += Cross(poly[0], poly[2 * i], poly[2 * i - 1], poly[2 * i + 1]);
+  for (int32_t i = 2; i + 1 < count; i += 2) {
+    sum += Cross(poly[0], poly[i], poly[i - 1], poly[i + 1]);
   }
   if (count % 2 != 0) sum += Cross(poly[0], poly[count - 2], poly[count - 2], poly[count - 1]);
   return sum * 0.5;
