@@ -53,6 +53,8 @@ class Slot {
     if constexpr (std::is_same_v<Value, M_Vector2T<float>>) {
       const M_Vector2T<double> wide = {value.x, value.y};
       return NearElements(wide, 1e4);
+    } else if constexpr (std::is_same_v<Value, M_Ratio>) {
+      return ::ToText(value);
     } else if constexpr (std::is_integral_v<Value>) {
       return std::to_string(value);
     } else if constexpr (IsPoint<Value> || IsRect<Value> || std::is_same_v<Value, M_WHRect>) {
@@ -66,6 +68,8 @@ class Slot {
   static Value Take(Arguments& in) {
     if constexpr (std::is_same_v<Value, double>) {
       return in.Double();
+    } else if constexpr (std::is_same_v<Value, M_Ratio>) {
+      return in.Ratio();
     } else if constexpr (std::is_integral_v<Value>) {
       return static_cast<Value>(in.Int());
     } else if constexpr (std::is_same_v<Value, M_Vector2T<float>>) {

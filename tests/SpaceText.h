@@ -147,6 +147,16 @@ std::string InAnyPlace(const Record& a, const Record& b,
   return results[0];
 }
 
+/// The outcome of a call that may throw a code.
+inline std::string Thrown(const std::function<void()>& call) {
+  try {
+    call();
+  } catch (int code) {
+    return Outcome(code);
+  }
+  return Outcome(0);
+}
+
 /// Records up to the end of the line.
 template <class Record>
 std::vector<Record> ReadAll(Arguments& in) {

@@ -290,15 +290,6 @@ TEST_F(Space, RotationsAreThoseOfThePlatform) {
     M_ConcatMatrix(&rotation, &expected);
     ASSERT_EQ(std::memcmp(&rotated, &expected, sizeof expected), 0);
   }
-  M_Matrix3 quarter;
-  V2 points[] = {{10, 0}, {11, 0}};
-  M_SetIdentityMatrix(&quarter);
-  M_RotateMatrix(&quarter, 90, 10, 0);
-  M_TransformFloatPoints(&quarter, 2, points);
-  EXPECT_NEAR(points[0].x, 10, 1e-14);
-  EXPECT_NEAR(points[0].y, 0, 1e-14);
-  EXPECT_NEAR(points[1].x, 10, 1e-14);
-  EXPECT_NEAR(points[1].y, 1, 1e-14);
 }
 
 }  // namespace

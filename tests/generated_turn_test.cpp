@@ -202,22 +202,4 @@ TEST_F(Turns, ClippedLinesStayOnTheLineAndInside) {
   EXPECT_GT(visibles, 1000);
 }
 
-TEST_F(Turns, BearingsPointBack) {
-  for (int round = 0; round < 5000; ++round) {
-    const V2 v = {Uniform(1), Uniform(1)};
-    const double bearing = M_VecToAngle(v) * std::numbers::pi / 180, length = std::hypot(v.x, v.y);
-    ASSERT_NEAR(std::sin(bearing) * length, v.x, kNear);
-    ASSERT_NEAR(-std::cos(bearing) * length, v.y, kNear);
-    const auto angle = static_cast<double>(generator_.Small(720));
-    const M_Vector2T<float> centre = {3, -4};
-    M_Vector2T<float> point = {centre.x + static_cast<float>(v.x),
-                               centre.y + static_cast<float>(v.y)};
-    M_TransformPtF(&centre, angle, &point);
-    const double c = std::cos(angle * std::numbers::pi / 180),
-                 s = std::sin(angle * std::numbers::pi / 180);
-    ASSERT_NEAR(point.x, centre.x + v.x * c - v.y * s, 1e-5);
-    ASSERT_NEAR(point.y, centre.y + v.x * s + v.y * c, 1e-5);
-  }
-}
-
 }  // namespace

@@ -22,53 +22,12 @@ std::string Arithmetic(Arguments& in) {
   });
 }
 
-template <auto kOperation>
-std::string Unary(Arguments& in) {
-  return Aliased({in.Ratio()}, [](const M_Ratio* operands, M_Ratio* out) {
-    M_Ratio unflagged = *operands;
-    unsigned char flag = 9;
-    const int32_t code =
-        kOperation(operands, out, &flag) | kOperation(&unflagged, &unflagged, nullptr);
-    EXPECT_EQ(ToText(unflagged), ToText(*out));
-    return Text(*out, flag).append(Outcome(code));
-  });
-}
-
-template <auto kOperation>
-std::string Clip(Arguments& in) {
+std::string ClipRatio(Arguments& in) {
   const M_Ratio value = in.Ratio(), lo = in.Ratio(), hi = in.Ratio();
   return Aliased({value, lo, hi}, [](const M_Ratio* operands, M_Ratio* out) {
     const std::string before = ToText(*out);
-    const int32_t code = kOperation(operands, operands + 1, operands + 2, out);
+    const int32_t code = M_ClipRatio(operands, operands + 1, operands + 2, out);
     return Text(code != 0 && ToText(*out) == before ? "kept" : ToText(*out)).append(Outcome(code));
-  });
-}
-
-// The start in each operand, and the duration in the next one.
-std::string ClipSpan(Arguments& in) {
-  const M_Ratio startA = in.Ratio(), durationA = in.Ratio(), startB = in.Ratio();
-  return Aliased(
-      {startA, durationA, startB, in.Ratio()}, [](const M_Ratio* operands, M_Ratio* out) {
-        M_Ratio* const duration = const_cast<M_Ratio*>(operands) + (out - operands + 1) % 5;
-        const int32_t code =
-            M_ClipSpanToSpan(operands, operands + 1, operands + 2, operands + 3, out, duration);
-        return Text(*out, *duration).append(Outcome(code));
-      });
-}
-
-std::string Compare(Arguments& in) {
-  const M_Ratio a = in.Ratio();
-  return Aliased({a, in.Ratio()}, [](const M_Ratio* operands, M_Ratio* out) {
-    M_Ratio copies[] = {operands[0], operands[1], {77, 77}};
-    M_Ratio* const greatest = copies + (out - operands);
-    int32_t order = 99;
-    const int32_t code = M_CompareRatio(operands, operands + 1, &order);
-    const std::string outcome = Outcome(code);
-    EXPECT_EQ(M_MaxRatio(copies, copies + 1, greatest), code);
-    EXPECT_EQ(Outcome(code), outcome);
-    EXPECT_EQ(M_MinRatio(operands, operands + 1, out), code);
-    EXPECT_EQ(Outcome(code), outcome);
-    return Text(order, *out, *greatest).append(outcome);
   });
 }
 
@@ -117,6 +76,8 @@ std::string LongMultiply(Arguments& in) {
   return Text(out[0], out[1]).append(Outcome(code));
 }
 
+constexpr CallOptions kFlagged = {.nullable = 4};
+
 const Operation kOperations[] = {
     {"AddRatio", Arithmetic<M_AddRatio>},
     {"AddWouldOverflow", Call<M_AddWouldOverflow>},
@@ -135,10 +96,10 @@ const Operation kOperations[] = {
     {"UMulWouldOverflow", Call<M_UMulWouldOverflow>},
     {"UnsignedGCD", Call<M_UnsignedGCD>},
     {"UnsignedLCM", Call<M_UnsignedLCM>},
-    {"ClipRatio", Clip<M_ClipRatio>},
-    {"ClipRatioToSpan", Clip<M_ClipRatioToSpan>},
-    {"ClipSpanToSpan", ClipSpan},
-    {"CompareRatio", Compare},
+    {"ClipRatio", ClipRatio},
+    {"ClipRatioToSpan", Call<M_ClipRatioToSpan>},
+    {"ClipSpanToSpan", Call<M_ClipSpanToSpan>},
+    {"CompareRatio", Call<M_CompareRatio>},
     {"ConvRatio", Convert},
     {"DivRatio", Arithmetic<M_DivRatio>},
     {"Fix24Mul", Call<M_Fix24Mul>},
@@ -152,9 +113,11 @@ const Operation kOperations[] = {
        const int nibble = in.Int();
        return Text(Mp_G_lead_zeros[nibble], Mp_G_trail_zeros[nibble]);
      }},
+    {"MaxRatio", Call<M_MaxRatio>},
+    {"MinRatio", Call<M_MinRatio>},
     {"MulRatio", Arithmetic<M_MulRatio>},
-    {"RecipRatio", Unary<M_RecipRatio>},
-    {"ReduceRatio", Unary<M_ReduceRatio>},
+    {"RecipRatio", Call<M_RecipRatio, kFlagged>},
+    {"ReduceRatio", Call<M_ReduceRatio, kFlagged>},
     {"RoundToNearestMult", Call<M_RoundToNearestMult>},
     {"ShortConvRatio", ShortConvert},
     {"SubRatio", Arithmetic<M_SubRatio>},

@@ -129,15 +129,6 @@ std::string Project(Arguments& in) {
   return Text(m);
 }
 
-std::string Thrown(const std::function<void()>& call) {
-  try {
-    call();
-  } catch (int code) {
-    return Outcome(code);
-  }
-  return Outcome(0);
-}
-
 std::string Normalize(Arguments& in) {
   auto v = Read<M_Vector4T<double>>(in);
   const std::string outcome = Thrown([&] { v.Normalize(); });
