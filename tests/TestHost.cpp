@@ -41,6 +41,10 @@ void* operator new(size_t bytes) {
   if (!block) throw std::bad_alloc();
   return block;
 }
+// Named, too, because a sanitizer's own does not come here.
+void* operator new[](size_t bytes) { return operator new(bytes); }
+void operator delete[](void* block) noexcept { std::free(block); }
+void operator delete[](void* block, size_t) noexcept { std::free(block); }
 void operator delete(void* block) noexcept { std::free(block); }
 void operator delete(void* block, size_t) noexcept { std::free(block); }
 
