@@ -41,6 +41,15 @@ void* operator new(size_t bytes) {
   if (!block) throw std::bad_alloc();
   return block;
 }
+void* U_MemTrackedObject::TrackedNew(size_t bytes, bool) {
+  ++host.trackedBlocks;
+  return std::malloc(host.trackedBytes = bytes);
+}
+void U_MemTrackedObject::TrackedDelete(void* block) {
+  --host.trackedBlocks;
+  std::free(block);
+}
+
 // Named, too, because a sanitizer's own does not come here.
 void* operator new[](size_t bytes) { return operator new(bytes); }
 void operator delete[](void* block) noexcept { std::free(block); }

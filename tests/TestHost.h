@@ -17,6 +17,8 @@ struct TestHost {
   int allocations = 0;             ///< Attempts to allocate a handle.
   std::vector<int> failing;        ///< Attempts that fail, counted from 1.
   int handles = 0;                 ///< Handles not freed.
+  int trackedBlocks = 0;           ///< Tracked blocks not freed.
+  size_t trackedBytes = 0;         ///< Of the last one.
   int news = 0;                    ///< Calls of operator new.
   bool failsNextNew = false;       ///< Whether the next one fails.
   int32_t reportResult = 0;        ///< What reports with a host error return; 0: the host error.
