@@ -11,6 +11,7 @@
 
 #include "Comparison.h"
 #include "M_Utils.h"
+#include "Random.h"
 
 #ifdef BENCH_HAS_BOOST
 #include <boost/rational.hpp>
@@ -24,21 +25,13 @@ extern "C" {
 namespace {
 
 using bench::Line;
+using bench::Random;
 using bench::Require;
 
 template <class T>
 using Pairs = std::vector<std::pair<T, T>>;
 
 constexpr size_t kOperands = 4096;
-
-// xorshift64*: the same operands everywhere.
-uint32_t Random() {
-  static uint64_t state = 0x9E3779B97F4A7C15;
-  state ^= state >> 12;
-  state ^= state << 25;
-  state ^= state >> 27;
-  return static_cast<uint32_t>(state * 0x2545F4914F6CDD1D >> 32);
-}
 
 // A second of frames, in the units of a time base: 5 * 1001/30000, 17/600, ...
 M_Ratio FrameTime() {

@@ -14,23 +14,14 @@
 #include "Comparison.h"
 #include "M_Matrix.h"
 #include "Peers.h"
+#include "Random.h"
 
 namespace {
 
 using bench::Batch;
+using bench::Random;
 using bench::Require;
-
-// xorshift64*: the same operands everywhere.
-uint32_t Random() {
-  static uint64_t state = 0x9E3779B97F4A7C15;
-  state ^= state >> 12;
-  state ^= state << 25;
-  state ^= state >> 27;
-  return static_cast<uint32_t>(state * 0x2545F4914F6CDD1D >> 32);
-}
-double Uniform(double lowest, double highest) {
-  return lowest + (highest - lowest) * Random() / 4294967296.0;
-}
+using bench::Uniform;
 
 // Points go round and round in place, so the matrices are of finite order: nothing grows, nothing
 // vanishes.

@@ -2,8 +2,8 @@
 //
 // The hull is that of the points moved to a lattice of 2^29 steps along each axis, on which
 // products of differences are exact in 64 bits. Its corners are the same whatever the method; this
-// one drops what lies well inside some of the points before anything is moved, and sorts the rest
-// by x.
+// one drops what lies well inside some of the points before anything is moved, sorts the rest by x,
+// and walks along those below and those above the line from the first to the last.
 
 #include <algorithm>
 #include <array>
@@ -17,6 +17,7 @@
 
 #include "M_Matrix.h"
 #include "Mp_Hull.h"
+#include "Mp_Lanes.h"
 
 // The host's own type is not hidden, or what is made of it would be.
 #pragma GCC visibility push(default)
@@ -32,14 +33,6 @@ struct Point {
 struct Box {
   double left, top, right, bottom;
 };
-
-// A number that is none widens nothing.
-void Include(const Point& p, Box* box) {
-  box->left = p.x < box->left ? p.x : box->left;
-  box->right = p.x > box->right ? p.x : box->right;
-  box->top = p.y < box->top ? p.y : box->top;
-  box->bottom = p.y > box->bottom ? p.y : box->bottom;
-}
 
 constexpr double kInfinity = std::numeric_limits<double>::infinity();
 constexpr Box kNothing = {kInfinity, kInfinity, -kInfinity, -kInfinity};
@@ -74,44 +67,145 @@ class Axis {
   double step_;
 };
 
+// Two coordinates in the order of the points: by x, and by y where that is the same.
+using Key = uint64_t;
+
+M_LongPoint ToPoint(Key key) {
+  return {static_cast<int32_t>(key >> 32), static_cast<int32_t>(key)};
+}
+
 struct Lattice {
   Axis x, y;
 
   explicit Lattice(const Box& box) : x(box.left, box.right), y(box.top, box.bottom) {}
+
+  template <class T>
+  Key ToKey(const T& p) const {
+    const auto high = static_cast<Key>(x.ToLattice(static_cast<double>(p.x)));
+    return high << 32 | static_cast<Key>(y.ToLattice(static_cast<double>(p.y)));
+  }
 };
 
 // ---------------------------------------------------------------------------------------------
 // What is well inside
 // ---------------------------------------------------------------------------------------------
 
+// The coordinates of as many points as there are lanes, in some order.
+template <int kLanes>
+struct Coordinates {
+  using Doubles = typename Mp::Lanes<kLanes>::Doubles;
+  using Bits = typename Mp::Lanes<kLanes>::Bits;
+  Doubles x, y;
+
+  template <class T>
+  [[gnu::always_inline]] static Coordinates Load(const T* points) {
+    if constexpr (sizeof(T) == 2 * sizeof(double)) {
+      const auto a = Mp::Load<Doubles>(points);
+      const auto b = Mp::Load<Doubles>(points + kLanes / 2);
+      if constexpr (kLanes == 2) {
+        return {__builtin_shufflevector(a, b, 0, 2), __builtin_shufflevector(a, b, 1, 3)};
+      } else {
+        return {__builtin_shufflevector(a, b, 0, 4, 2, 6),
+                __builtin_shufflevector(a, b, 1, 5, 3, 7)};
+      }
+    } else {
+      Coordinates all;
+      for (int i = 0; i < kLanes; ++i) {
+        all.x[i] = static_cast<double>(points[Place(i)].x);
+        all.y[i] = static_cast<double>(points[Place(i)].y);
+      }
+      return all;
+    }
+  }
+
+  // Which of the points is in a lane.
+  static constexpr int Place(int lane) { return kLanes == 2 ? lane : lane / 2 + (lane % 2) * 2; }
+};
+
+// The least and the greatest of what has been seen; a NaN is neither.
+template <int kLanes>
+struct Extent {
+  using Doubles = typename Mp::Lanes<kLanes>::Doubles;
+  Doubles least = Doubles{} + kInfinity;
+  Doubles greatest = Doubles{} - kInfinity;
+
+  [[gnu::always_inline]] void Include(const Doubles& v) {
+    least = v < least ? v : least;
+    greatest = v > greatest ? v : greatest;
+  }
+
+  double Least() const {
+    double all = least[0];
+    for (int i = 1; i < kLanes; ++i) all = std::min(all, least[i]);
+    return all;
+  }
+
+  double Greatest() const {
+    double all = greatest[0];
+    for (int i = 1; i < kLanes; ++i) all = std::max(all, greatest[i]);
+    return all;
+  }
+};
+
 // An octagon of points of a sample, the farthest in eight directions, and a rectangle with one of
 // them beyond each of its corners. What lies within the margins of either is so far inside that its
 // place on the lattice is, too.
 class Interior {
  public:
+  // Even samples only. What is not in `sample` is not looked at.
   Interior(const Point* sample, size_t count) {
-    box_ = kNothing;
-    for (size_t i = 0; i < count; ++i) Include(sample[i], &box_);
+    using Two = Coordinates<2>;
+    using Doubles = Two::Doubles;
+    Extent<2> xs, ys;
+    for (size_t i = 0; i < count; i += 2) {
+      const Two p = Two::Load(sample + i);
+      xs.Include(p.x);
+      ys.Include(p.y);
+    }
+    box_ = {xs.Least(), ys.Least(), xs.Greatest(), ys.Greatest()};
     const double width = box_.right - box_.left;
     const double height = box_.bottom - box_.top;
     // Where products could overflow or vanish, nothing is inside. A NaN fails, too.
     const auto isModest = [](double number) { return number > 1e-100 && number < 1e100; };
-    const bool canTell = isModest(width) && isModest(height) &&
-                         isModest(1 + std::abs(box_.left) + std::abs(box_.top));
-    std::array<double, 8> farthest;
-    farthest.fill(-kInfinity);
+    if (!isModest(width) || !isModest(height) ||
+        !isModest(1 + std::abs(box_.left) + std::abs(box_.top))) {
+      return;
+    }
+
+    // Four directions; the others are opposite.
+    const auto distances = [&](size_t i) {
+      const Two p = Two::Load(sample + i);
+      const Doubles x = p.x * height;
+      const Doubles y = p.y * width;
+      return std::array<Doubles, 4>{x, x + y, y, y - x};
+    };
+    std::array<Extent<2>, 4> extents;
+    for (size_t i = 0; i < count; i += 2) {
+      const auto d = distances(i);
+      for (size_t k = 0; k < 4; ++k) extents[k].Include(d[k]);
+    }
+    std::array<double, 4> least, greatest;
+    for (size_t k = 0; k < 4; ++k) {
+      least[k] = extents[k].Least();
+      greatest[k] = extents[k].Greatest();
+    }
     std::array<Point, 8> corners = {};
-    for (size_t i = 0; i < count; ++i) {
-      const Point& p = sample[i];
-      const double x = p.x * height;
-      const double y = p.y * width;
-      const double distances[8] = {x, x + y, y, y - x, -x, -x - y, -y, x - y};
-      for (size_t k = 0; k < 8; ++k) {
-        if (!(distances[k] > farthest[k])) continue;
-        farthest[k] = distances[k];
-        corners[k] = p;
+    for (size_t i = 0; i < count; i += 2) {
+      const auto d = distances(i);
+      Two::Bits isFarthest = {};
+      for (size_t k = 0; k < 4; ++k) {
+        isFarthest |= static_cast<Two::Bits>(d[k] == least[k]);
+        isFarthest |= static_cast<Two::Bits>(d[k] == greatest[k]);
+      }
+      if ((isFarthest[0] | isFarthest[1]) == 0) continue;
+      for (size_t j = 0; j < 2; ++j) {
+        for (size_t k = 0; k < 4; ++k) {
+          if (d[k][j] == greatest[k]) corners[k] = sample[i + j];
+          if (d[k][j] == least[k]) corners[k + 4] = sample[i + j];
+        }
       }
     }
+
     // Far more than a lattice step is, even if the sample is far smaller than the whole.
     const double marginX = width * kStep * 1024;
     const double marginY = height * kStep * 1024;
@@ -127,29 +221,60 @@ class Interior {
       // A side without length says nothing; of one that is very short nothing can be said.
       const bool isPoint = dx == 0 && dy == 0;
       const bool isLong = std::abs(dx) > width * 0x1p-20 || std::abs(dy) > height * 0x1p-20;
-      sides_[k] = {p, dx, dy,
-                   isPoint  ? -1
-                   : isLong ? std::abs(dx) * marginY + std::abs(dy) * marginX
-                            : kInfinity};
-    }
-    if (!canTell) {
-      rectangle_ = kNothing;
-      sides_[0].margin = kInfinity;
+      const double margin = isPoint  ? -1
+                            : isLong ? std::abs(dx) * marginY + std::abs(dy) * marginX
+                                     : kInfinity;
+      sides_[k] = {dx, dy, margin + (dx * (p.y - box_.top) - dy * (p.x - box_.left))};
     }
   }
 
-  bool IsInRectangle(double x, double y) const {
-    return (rectangle_.left < x) & (x < rectangle_.right) & (rectangle_.top < y) &
-           (y < rectangle_.bottom);
-  }
-
-  // To the left of every side, which the points go round in whatever order they stand.
-  bool IsInOctagon(double x, double y) const {
-    for (const Side& side : sides_) {
-      if (!(side.dx * (y - side.start.y) - side.dy * (x - side.start.x) > side.margin))
-        return false;
+  // Copies the numbers of the points that may be corners to `kept`, which has room for all, and
+  // returns how many there are. *box becomes that of all points.
+  template <int kLanes, class T>
+  [[gnu::always_inline]] size_t KeepOutside(const T* points, size_t count, uint64_t* kept,
+                                            Box* box) const {
+    using Some = Coordinates<kLanes>;
+    using Bits = typename Some::Bits;
+    constexpr size_t kBlock = 2 * size_t{kLanes};
+    Extent<kLanes> xs, ys;
+    const std::array<Side, 8> sides = sides_;
+    const Box rectangle = rectangle_;
+    const Point origin = {box_.left, box_.top};
+    size_t number = 0;
+    size_t i = 0;
+    for (; i + kBlock <= count; i += kBlock) {
+      const Some halves[2] = {Some::Load(points + i), Some::Load(points + i + kLanes)};
+      Bits areAll = ~Bits{};
+      for (const Some& p : halves) {
+        areAll &= static_cast<Bits>((rectangle.left < p.x) & (p.x < rectangle.right) &
+                                    (rectangle.top < p.y) & (p.y < rectangle.bottom));
+      }
+      if (Mp::HoldsInAll<kLanes>(areAll)) continue;
+      for (size_t half = 0; half < 2; ++half) {
+        const Some& p = halves[half];
+        xs.Include(p.x);
+        ys.Include(p.y);
+        const auto x = p.x - origin.x;
+        const auto y = p.y - origin.y;
+        // To the left of every side, which the points go round in whatever order they stand.
+        Bits isInside = ~Bits{};
+        for (const Side& side : sides) {
+          isInside &= static_cast<Bits>(side.dx * y - side.dy * x > side.least);
+        }
+        for (int lane = 0; lane < kLanes; ++lane) {
+          kept[number] = i + half * size_t{kLanes} + static_cast<size_t>(Some::Place(lane));
+          number += isInside[lane] + 1;
+        }
+      }
     }
-    return true;
+    *box = {xs.Least(), ys.Least(), xs.Greatest(), ys.Greatest()};
+    for (; i < count; ++i) {
+      const Point p = {static_cast<double>(points[i].x), static_cast<double>(points[i].y)};
+      *box = {p.x < box->left ? p.x : box->left, p.y < box->top ? p.y : box->top,
+              p.x > box->right ? p.x : box->right, p.y > box->bottom ? p.y : box->bottom};
+      kept[number++] = i;
+    }
+    return number;
   }
 
   // Whether the margins were large enough for a lattice of all points.
@@ -159,154 +284,37 @@ class Interior {
   }
 
  private:
+  // Inside, as seen from the origin: dx * y - dy * x > least.
   struct Side {
-    Point start;
-    double dx, dy;
-    double margin;
+    double dx = 0;
+    double dy = 0;
+    double least = kInfinity;
   };
 
   Box box_;
-  Box rectangle_;
+  Box rectangle_ = kNothing;
   std::array<Side, 8> sides_;
 };
 
-// The points that may be corners: their numbers in `kept`, which has room for all, and their box.
-// Returns how many there are.
+template <class T>
+MP_TARGET_AVX2 size_t KeepOutsideWithAvx2(const Interior& interior, const T* points, size_t count,
+                                          uint64_t* kept, Box* box) {
+  return interior.KeepOutside<4>(points, count, kept, box);
+}
+
 template <class T>
 size_t KeepOutside(const Interior& interior, const T* points, size_t count, uint64_t* kept,
                    Box* box) {
-  constexpr size_t kBlock = 8;
-  size_t number = 0;
-  *box = kNothing;
-  const auto look = [&](size_t i) {
-    const Point p = {static_cast<double>(points[i].x), static_cast<double>(points[i].y)};
-    if (interior.IsInRectangle(p.x, p.y) || interior.IsInOctagon(p.x, p.y)) return;
-    Include(p, box);
-    kept[number++] = i;
-  };
-  const Interior local = interior;
-  size_t i = 0;
-  for (; i + kBlock <= count; i += kBlock) {
-    int areAll = 1;
-    for (size_t j = i; j < i + kBlock; ++j) {
-      areAll &=
-          local.IsInRectangle(static_cast<double>(points[j].x), static_cast<double>(points[j].y));
-    }
-    if (areAll) continue;
-    for (size_t j = i; j < i + kBlock; ++j) look(j);
-  }
-  for (; i < count; ++i) look(i);
-  return number;
+  if (Mp::HasAvx2()) return KeepOutsideWithAvx2(interior, points, count, kept, box);
+  return interior.KeepOutside<2>(points, count, kept, box);
 }
-
-// ---------------------------------------------------------------------------------------------
-// Sorting
-// ---------------------------------------------------------------------------------------------
-
-bool IsLeftOf(const M_LongPoint& a, const M_LongPoint& b) {
-  return a.x != b.x ? a.x < b.x : a.y < b.y;
-}
-
-// By x, and by y where that is the same. From some number on by the digits of x, into `scratch` and
-// back; the few of the same x are put in order afterwards.
-void SortByX(M_LongPoint* points, size_t count, M_LongPoint* scratch) {
-  constexpr int kBits = 10;
-  constexpr size_t kDigits = size_t{1} << kBits;
-  // Coordinates are below 2^30: three digits.
-  std::array<std::array<size_t, kDigits>, 3> starts = {};
-  for (size_t i = 0; i < count; ++i) {
-    const auto x = static_cast<uint32_t>(points[i].x);
-    ++starts[0][x % kDigits];
-    ++starts[1][x >> kBits & (kDigits - 1)];
-    ++starts[2][x >> 2 * kBits];
-  }
-  M_LongPoint* from = points;
-  M_LongPoint* to = scratch;
-  for (size_t digit = 0; digit < 3; ++digit) {
-    size_t sum = 0;
-    for (size_t& start : starts[digit]) sum += std::exchange(start, sum);
-    for (size_t i = 0; i < count; ++i) {
-      const uint32_t value = static_cast<uint32_t>(from[i].x) >> digit * kBits;
-      to[starts[digit][value & (kDigits - 1)]++] = from[i];
-    }
-    std::swap(from, to);
-  }
-  std::copy(from, from + count, points);
-  for (size_t i = 0; i < count;) {
-    size_t end = i + 1;
-    while (end < count && points[end].x == points[i].x) ++end;
-    if (end - i > 1) std::sort(points + i, points + end, IsLeftOf);
-    i = end;
-  }
-}
-
-// ---------------------------------------------------------------------------------------------
-// The hull of lattice points
-// ---------------------------------------------------------------------------------------------
-
-// Twice the area of a triangle, positive when it turns counter-clockwise.
-int64_t Turn(const M_LongPoint& a, const M_LongPoint& b, const M_LongPoint& c) {
-  return (int64_t{b.x} - a.x) * (int64_t{c.y} - b.y) - (int64_t{b.y} - a.y) * (int64_t{c.x} - b.x);
-}
-
-// Extends a chain that began at `bottom` by a point, and takes back what no longer turns left.
-M_LongPoint* Extend(M_LongPoint* bottom, M_LongPoint* top, const M_LongPoint& p) {
-  while (top - bottom >= 2 && Turn(top[-2], top[-1], p) <= 0) --top;
-  *top = p;
-  return top + 1;
-}
-
-// The corners of sorted points without repetitions, from the leftmost counter-clockwise. `hull` has
-// room for one more than there are points. Returns how many corners there are.
-size_t Chain(const M_LongPoint* points, size_t count, M_LongPoint* hull) {
-  M_LongPoint* top = hull;
-  for (size_t i = 0; i < count; ++i) top = Extend(hull, top, points[i]);
-  if (count == 1) return 1;
-  M_LongPoint* const bottom = top - 1;
-  for (size_t i = count - 1; i-- > 0;) top = Extend(bottom, top, points[i]);
-  return static_cast<size_t>(top - hull) - 1;
-}
-
-bool IsLower(const M_LongPoint& a, const M_LongPoint& b) {
-  return a.y != b.y ? a.y < b.y : a.x < b.x;
-}
-
-// Of points on one line: the lowest, the farthest from it and the next farthest, which may lie at
-// the same place. Kept on purpose.
-size_t HullOfLine(const M_LongPoint* points, size_t count, M_LongPoint* hull) {
-  const M_LongPoint pivot = *std::min_element(points, points + count, IsLower);
-  const Mp_CompareAngleAndDist isBefore(pivot);
-  size_t number = 1;
-  hull[0] = pivot;
-  for (size_t i = 0; i < count; ++i) {
-    const M_LongPoint p = points[i];
-    if (p.x == pivot.x && p.y == pivot.y) continue;
-    if (number == 1) {
-      hull[number++] = p;
-    } else if (isBefore(p, hull[1])) {
-      hull[2] = std::exchange(hull[1], p);
-      number = 3;
-    } else if (number == 2 || isBefore(p, hull[2])) {
-      hull[2] = p;
-      number = 3;
-    }
-  }
-  return number;
-}
-
-// ---------------------------------------------------------------------------------------------
-// The whole
-// ---------------------------------------------------------------------------------------------
-
-// From so many points on it pays to look for what is inside, and to sort by digits.
-constexpr size_t kMany = 1024;
 
 template <class T>
 Interior InteriorOfSample(const T* points, size_t count) {
-  constexpr size_t kLeast = 256;
+  constexpr size_t kLeast = 512;
   constexpr size_t kMost = 2048;
   std::array<Point, kMost> sample;
-  const size_t size = std::clamp(count / 256, kLeast, kMost);
+  const size_t size = std::min(count, std::clamp(count / 256, kLeast, kMost)) & ~size_t{1};
   for (size_t i = 0; i < size; ++i) {
     const T& p = points[i * (count / size)];
     sample[i] = {static_cast<double>(p.x), static_cast<double>(p.y)};
@@ -314,70 +322,147 @@ Interior InteriorOfSample(const T* points, size_t count) {
   return Interior(sample.data(), size);
 }
 
+// Leaves the numbers of the points that may be corners in `kept` and returns how many there are.
+template <class T>
+size_t KeepCandidates(const T* points, size_t count, uint64_t* kept, Box* box) {
+  // Of so few, most are corners.
+  constexpr size_t kFew = 32;
+  if (count >= kFew) {
+    const Interior interior = InteriorOfSample(points, count);
+    const size_t number = KeepOutside(interior, points, count, kept, box);
+    if (interior.HoldsFor(*box)) return number;
+  }
+  return KeepOutside(Interior(nullptr, 0), points, count, kept, box);
+}
+
+// ---------------------------------------------------------------------------------------------
+// Sorting
+// ---------------------------------------------------------------------------------------------
+
+// From some number on by the digits of x, and the few of the same x afterwards. Returns where the
+// keys are then, in `keys` or in `scratch`.
+Key* Sort(Key* keys, size_t count, Key* scratch) {
+  constexpr size_t kMany = 1024;
+  if (count < kMany) {
+    std::sort(keys, keys + count);
+    return keys;
+  }
+  constexpr int kBits = 10;
+  constexpr size_t kDigits = size_t{1} << kBits;
+  // Coordinates are below 2^30: three digits.
+  const auto digitOf = [](Key key, size_t place) {
+    return key >> (32 + place * kBits) & (kDigits - 1);
+  };
+  std::array<std::array<size_t, kDigits>, 3> starts = {};
+  for (size_t i = 0; i < count; ++i) {
+    for (size_t place = 0; place < 3; ++place) ++starts[place][digitOf(keys[i], place)];
+  }
+  Key* from = keys;
+  Key* to = scratch;
+  for (size_t place = 0; place < 3; ++place) {
+    size_t sum = 0;
+    for (size_t& start : starts[place]) sum += std::exchange(start, sum);
+    for (size_t i = 0; i < count; ++i) to[starts[place][digitOf(from[i], place)]++] = from[i];
+    std::swap(from, to);
+  }
+  for (size_t i = 0; i < count;) {
+    size_t end = i + 1;
+    while (end < count && from[end] >> 32 == from[i] >> 32) ++end;
+    if (end - i > 1) std::sort(from + i, from + end);
+    i = end;
+  }
+  return from;
+}
+
+// ---------------------------------------------------------------------------------------------
+// The hull of lattice points
+// ---------------------------------------------------------------------------------------------
+
+// Twice the area of a triangle, positive when it turns counter-clockwise.
+int64_t Turn(Key a, Key b, Key c) {
+  const M_LongPoint p = ToPoint(a), q = ToPoint(b), r = ToPoint(c);
+  return (int64_t{q.x} - p.x) * (int64_t{r.y} - q.y) - (int64_t{q.y} - p.y) * (int64_t{r.x} - q.x);
+}
+
+// Leaves of a chain of points, in place, those at which it turns left. Returns how many there are.
+size_t KeepLeftTurns(Key* points, size_t count) {
+  size_t top = 1;
+  for (size_t i = 1; i < count; ++i) {
+    while (top >= 2 && Turn(points[top - 2], points[top - 1], points[i]) <= 0) --top;
+    points[top++] = points[i];
+  }
+  return top;
+}
+
+bool IsLower(Key a, Key b) {
+  const M_LongPoint p = ToPoint(a), q = ToPoint(b);
+  return p.y != q.y ? p.y < q.y : p.x < q.x;
+}
+
+// Of points on one line, by the two at either end of it: the lowest, the farthest from it and the
+// next farthest, which may lie at the same place. Kept on purpose.
+size_t HullOfLine(const std::array<Key, 4>& ends, Key* hull) {
+  const Key pivot = *std::min_element(ends.begin(), ends.end(), IsLower);
+  hull[0] = pivot;
+  Key* const end = std::remove_copy(ends.begin(), ends.end(), hull + 1, pivot);
+  const Mp_CompareAngleAndDist isBefore(ToPoint(pivot));
+  std::sort(hull + 1, end, [&](Key a, Key b) { return isBefore(ToPoint(a), ToPoint(b)); });
+  return std::min<size_t>(static_cast<size_t>(end - hull), 3);
+}
+
+// The corners of four or more sorted points, or of three that are no line, from the lowest
+// counter-clockwise, in place. Returns how many there are. Both arrays have room for all points.
+size_t Hull(Key* sorted, size_t count, Key* scratch) {
+  const Key first = sorted[0];
+  const Key last = sorted[count - 1];
+  if (first == last) return 1;
+  const std::array<Key, 4> ends = {first, sorted[1], sorted[count - 2], last};
+  // Those below the line from the first to the last stay, those above go to the end of the scratch,
+  // from right to left.
+  Key* below = sorted + 1;
+  Key* const aboveEnd = scratch + count;
+  Key* above = aboveEnd - 1;
+  *above = first;  // There are points: NOLINT(clang-analyzer-cplusplus.NewDelete)
+  for (size_t i = 1; i + 1 < count; ++i) {
+    const Key key = sorted[i];
+    const int64_t turn = Turn(first, last, key);
+    *below = key;
+    below += turn < 0;
+    above[-1] = key;
+    above -= turn > 0;
+  }
+  if (below == sorted + 1 && above == aboveEnd - 1) return HullOfLine(ends, sorted);
+  *below++ = last;
+  *--above = last;
+  const size_t corners = KeepLeftTurns(sorted, static_cast<size_t>(below - sorted));
+  const size_t others = KeepLeftTurns(above, static_cast<size_t>(aboveEnd - above));
+  Key* const end = std::copy(above + 1, above + others - 1, sorted + corners);
+  std::rotate(sorted, std::min_element(sorted, end, IsLower), end);
+  return static_cast<size_t>(end - sorted);
+}
+
+// ---------------------------------------------------------------------------------------------
+// The whole
+// ---------------------------------------------------------------------------------------------
+
 template <class T>
 std::vector<T> ComputeHull(const T* points, size_t count) {
-  static_assert(sizeof(M_LongPoint) == sizeof(uint64_t));
   // First the numbers of the points that are kept, then these on the lattice, in the same place.
-  const std::unique_ptr<uint64_t[]> kept(new uint64_t[count]);
-  Box box = kNothing;
-  size_t number = 0;
-  if (count >= kMany) {
-    const Interior interior = InteriorOfSample(points, count);
-    number = KeepOutside(interior, points, count, kept.get(), &box);
-    if (!interior.HoldsFor(box)) number = 0;
-  }
-  if (number == 0) {
-    box = kNothing;
-    for (number = 0; number < count; ++number) {
-      const T& p = points[number];
-      Include({static_cast<double>(p.x), static_cast<double>(p.y)}, &box);
-      kept[number] = number;
-    }
-  }
+  const std::unique_ptr<uint64_t[]> work(new uint64_t[count]);
+  Box box;
+  const size_t number = KeepCandidates(points, count, work.get(), &box);
   const Lattice lattice(box);
-  const std::unique_ptr<M_LongPoint[]> work(new M_LongPoint[2 * number + 1]);
-  M_LongPoint* const onLattice = work.get();
-  M_LongPoint* const hull = onLattice + number;
-  for (size_t i = 0; i < number; ++i) {
-    const T& p = points[kept[i]];
-    onLattice[i] = {lattice.x.ToLattice(static_cast<double>(p.x)),
-                    lattice.y.ToLattice(static_cast<double>(p.y))};
-  }
-
-  if (number >= kMany) {
-    SortByX(onLattice, number, hull);
-  } else {
-    std::sort(onLattice, onLattice + number, IsLeftOf);
-  }
-  const auto isSame = [](const M_LongPoint& a, const M_LongPoint& b) {
-    return a.x == b.x && a.y == b.y;
-  };
-  // Repetitions count for points on a line only.
-  const bool isOnePlace = isSame(onLattice[0], onLattice[number - 1]);
-  size_t corners = 1;
-  if (isOnePlace) {
-    hull[0] = onLattice[0];
-  } else {
-    const auto isOnLine = [&](const M_LongPoint& p) {
-      return Turn(onLattice[0], onLattice[number - 1], p) == 0;
-    };
-    if (std::all_of(onLattice, onLattice + number, isOnLine)) {
-      M_LongPoint line[3];
-      corners = HullOfLine(onLattice, number, line);
-      std::copy(line, line + corners, hull);
-    } else {
-      const auto unique =
-          static_cast<size_t>(std::unique(onLattice, onLattice + number, isSame) - onLattice);
-      corners = Chain(onLattice, unique, hull);
-      std::rotate(hull, std::min_element(hull, hull + corners, IsLower), hull + corners);
-    }
-  }
+  for (size_t i = 0; i < number; ++i) work[i] = lattice.ToKey(points[work[i]]);
+  const std::unique_ptr<Key[]> scratch(new Key[number]);
+  Key* const sorted = Sort(work.get(), number, scratch.get());
+  const size_t corners = Hull(sorted, number, sorted == work.get() ? scratch.get() : work.get());
 
   std::vector<T> result(corners, T{});
   for (size_t i = 0; i < corners; ++i) {
     using Coord = decltype(T::x);
-    result[i].x = static_cast<Coord>(lattice.x.FromLattice(hull[i].x));
-    result[i].y = static_cast<Coord>(lattice.y.FromLattice(hull[i].y));
+    const M_LongPoint p = ToPoint(sorted[i]);
+    result[i].x = static_cast<Coord>(lattice.x.FromLattice(p.x));
+    result[i].y = static_cast<Coord>(lattice.y.FromLattice(p.y));
   }
   return result;
 }

@@ -11,6 +11,7 @@
 
 #include "M_Matrix.h"
 #include "M_Rect.h"
+#include "Mp_Lanes.h"
 #include "Mp_Tolerance.h"
 #include "Mp_Vector3.h"
 #include "U.h"
@@ -23,9 +24,9 @@ using Vector3 = M_Vector3T<double>;
 // Zeros of either sign differ, NaNs of the same bits do not.
 template <class Point>
 bool IsSameBitwise(const Point& a, const Point& b) {
-  using Word = std::conditional_t<sizeof(Point) == 16, uint64_t, uint32_t>;
-  using Words = std::array<Word, 2>;
-  return std::bit_cast<Words>(a) == std::bit_cast<Words>(b);
+  using Word = std::conditional_t<sizeof a.x == sizeof(uint64_t), uint64_t, uint32_t>;
+  return std::bit_cast<Word>(a.x) == std::bit_cast<Word>(b.x) &&
+         std::bit_cast<Word>(a.y) == std::bit_cast<Word>(b.y);
 }
 
 template <class Point>
@@ -55,30 +56,37 @@ bool IsNearEdge(const Vector2& p, const Vector2& a, const Vector2& b, double squ
   return squaredTolerance >= SquaredDistance(p, a) || squaredTolerance >= SquaredDistance(p, b);
 }
 
-// Half-open, so that a vertex belongs to one of its edges, and an upright edge to nobody.
-template <class Coord>
-bool Straddles(Coord a, Coord b, Coord x) {
-  return ((a < x) & (x <= b)) | ((b < x) & (x <= a));
+// Bit i tells whether point i lies before x, for up to 64 points.
+template <class Point>
+uint64_t FindBefore(const Point* points, int32_t count, decltype(Point::x) x) {
+  using Doubles = Mp::Lanes<2>::Doubles;
+  using Bits = Mp::Lanes<2>::Bits;
+  const Doubles limit = {x, x};
+  Bits pairs = {};
+  const int32_t even = count & ~1;
+  for (int32_t i = even - 2; i >= 0; i -= 2) {
+    const Doubles pair = {points[i].x, points[i + 1].x};
+    pairs = pairs << 2 | (static_cast<Bits>(pair < limit) & Bits{1, 2});
+  }
+  uint64_t before = pairs[0] | pairs[1];
+  if (even < count) before |= uint64_t{points[even].x < x} << even;
+  return before;
 }
 
-// The edges of a polygon, edge i from point i to the next, that straddle x; returns how many. Most
-// do not, and are passed over a block at a time.
+// The edges of a polygon, edge i from point i to the next, that straddle x; returns how many. An
+// end at x lies behind it: so a vertex belongs to one of its edges, and an upright edge to nobody.
+// An edge with a NaN among them does no harm: what is computed for it is a NaN.
 template <class Point>
 int32_t FindStraddling(const Point* poly, int32_t count, decltype(Point::x) x, int32_t* edges) {
-  constexpr int32_t kBlock = 16;
+  constexpr int32_t kBlock = 64;
   int32_t found = 0;
-  const auto look = [&](int32_t i, int32_t next) {
-    if (Straddles(poly[i].x, poly[next].x, x)) edges[found++] = i;
-  };
-  int32_t i = 0;
-  for (; i < count - kBlock; i += kBlock) {
-    int isAny = 0;
-    for (int32_t j = i; j < i + kBlock; ++j) isAny |= Straddles(poly[j].x, poly[j + 1].x, x);
-    if (!isAny) continue;
-    for (int32_t j = i; j < i + kBlock; ++j) look(j, j + 1);
+  for (int32_t i = 0; i < count; i += kBlock) {
+    const int32_t size = std::min(count - i, kBlock);
+    const uint64_t before = FindBefore(poly + i, size, x);
+    const uint64_t last = poly[i + size < count ? i + size : 0].x < x;
+    uint64_t changes = before ^ (before >> 1 | last << (size - 1));
+    for (; changes != 0; changes &= changes - 1) edges[found++] = i + std::countr_zero(changes);
   }
-  for (; i < count - 1; ++i) look(i, i + 1);
-  look(count - 1, 0);
   return found;
 }
 
@@ -124,7 +132,7 @@ bool IsInside(const Point& p, const Point* poly, int32_t count, double squaredTo
     const Vector2 b = next(edges[i]);
     const double y = (wide.x - b.x) / (a.x - b.x) * (a.y - b.y) + b.y;
     if (Mp::IsNearlyEqual(y, wide.y)) return true;
-    if (y > wide.y) isOdd = !isOdd;
+    isOdd ^= y > wide.y;
   }
   return isOdd;
 }

@@ -360,39 +360,22 @@ template <class Kernel, class Point>
   return done;
 }
 
-#if defined(__x86_64__) && !defined(M_BASELINE_VECTORS)
-
-bool HasAvx2() { return __builtin_cpu_supports("avx2"); }
-
 template <template <int> class Kernel, class Matrix, class Point>
-[[gnu::target("avx2")]] void TransformWithAvx2(const Matrix* m, int32_t count, Point* points) {
+MP_TARGET_AVX2 void TransformWithAvx2(const Matrix* m, int32_t count, Point* points) {
   TransformInLanes<Kernel, 4>(m, count, points);
 }
 
 template <class Traits>
-[[gnu::target("avx2")]] int32_t TransformWhileInsideWithAvx2(const M_Matrix3* m, int32_t count,
-                                                             typename Traits::Point* points) {
+MP_TARGET_AVX2 int32_t TransformWhileInsideWithAvx2(const M_Matrix3* m, int32_t count,
+                                                    typename Traits::Point* points) {
   int32_t done = TransformWhileInside<IntegerPoints<Traits, 4>>(m, count, points);
   done += TransformWhileInside<IntegerPoints<Traits, 2>>(m, count - done, points + done);
   return done;
 }
 
-#else
-
-// Never called.
-constexpr bool HasAvx2() { return false; }
-template <template <int> class Kernel, class Matrix, class Point>
-void TransformWithAvx2(const Matrix*, int32_t, Point*) {}
-template <class Traits>
-int32_t TransformWhileInsideWithAvx2(const M_Matrix3*, int32_t, typename Traits::Point*) {
-  return 0;
-}
-
-#endif
-
 template <template <int> class Kernel, class Matrix, class Point>
 void TransformBatch(const Matrix* m, int32_t count, Point* points) {
-  if (HasAvx2()) return TransformWithAvx2<Kernel>(m, count, points);
+  if (Mp::HasAvx2()) return TransformWithAvx2<Kernel>(m, count, points);
   TransformWithBaseline<Kernel>(m, count, points);
 }
 
@@ -411,8 +394,8 @@ int32_t TransformIntegers(const M_Matrix3* m, int32_t count, typename Traits::Po
   const double tx = a[2][0] * Traits::kUnit;
   const double ty = a[2][1] * Traits::kUnit;
   for (int32_t i = 0; i < count;) {
-    i += HasAvx2() ? TransformWhileInsideWithAvx2<Traits>(m, count - i, points + i)
-                   : TransformWhileInside<IntegerPoints<Traits, 2>>(m, count - i, points + i);
+    i += Mp::HasAvx2() ? TransformWhileInsideWithAvx2<Traits>(m, count - i, points + i)
+                       : TransformWhileInside<IntegerPoints<Traits, 2>>(m, count - i, points + i);
     // The block at which that stopped, or what is left over, point by point.
     constexpr int32_t kBlock = IntegerPoints<Traits, 2>::kBlock;
     for (const int32_t end = i + std::min(count - i, kBlock); i < end; ++i) {

@@ -10,6 +10,16 @@
 
 namespace Mp {
 
+// A function compiled for AVX2, and whether it may be called; elsewhere, and where AVX2 is left
+// out, it never is.
+#if defined(__x86_64__) && !defined(M_BASELINE_VECTORS)
+#define MP_TARGET_AVX2 [[gnu::target("avx2")]]
+inline bool HasAvx2() { return __builtin_cpu_supports("avx2"); }
+#else
+#define MP_TARGET_AVX2
+constexpr bool HasAvx2() { return false; }
+#endif
+
 /// A vector of doubles, and one of their bits. A comparison gives all bits or none.
 template <int kLanes>
 struct Lanes {
