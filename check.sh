@@ -2,6 +2,8 @@
 # Installs what is missing, builds, and runs every test.
 # --all: also with clang++ and clang-tidy, with the sanitizers, as a static library with baseline vectors
 # only, and unoptimised.
+# --everywhere: instead, whether all builds on all processors give the same bits.
+# --fuzz SECONDS: instead, the fuzz targets, each for so long.
 set -eu
 cd "$(dirname "$0")"
 . scripts/common.sh
@@ -10,8 +12,18 @@ presets=release
 case ${1-} in
   '') ;;
   --all) presets='release clang asan tsan static debug' ;;
+  --everywhere)
+    . scripts/everywhere.sh
+    everywhere
+    exit
+    ;;
+  --fuzz)
+    . scripts/fuzz.sh
+    fuzz "${2-10}"
+    exit
+    ;;
   *)
-    echo "usage: check.sh [--all]"
+    echo "usage: check.sh [--all | --everywhere | --fuzz SECONDS]"
     exit 2
     ;;
 esac

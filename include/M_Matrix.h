@@ -382,8 +382,8 @@ struct M_Ray {
 static_assert(sizeof(M_Ray) == 64 && offsetof(M_Ray, direction) == 32);
 
 /// The plane of a polygon (Newell's method) through the mean of its points, which `centroid`
-/// receives unless it is null. The normal has unit length and points to where the polygon is seen
-/// counter-clockwise; of a polygon without area it is zero or, as rounding has it, any. Of no
+/// receives unless it is null. The normal points to where the polygon is seen counter-clockwise. It
+/// has unit length, unless twice the area is at most 1e-12: then it is that long. Of no
 /// points the mean and d are NaNs. Always 0.
 int32_t M_GetPlaneEquation(const M_Vector3T<double>* points, int32_t count, M_PlaneEq* plane,
                            M_Vector3T<double>* centroid);
@@ -418,8 +418,9 @@ int32_t M_Clip3DLine(const M_Vector3T<double>* p0, const M_Vector3T<double>* p1,
                      M_Vector3T<double>* crossing);
 
 /// Clips the line to the rectangle. *visible = whether something is left. A line with both ends
-/// inside, edges included, is; otherwise one that only touches the rectangle is not, and neither is
-/// one along x or y. The points may have been moved also where nothing is left. Always 0.
+/// inside, edges included, is; otherwise one whose extent only touches the rectangle's is not, and
+/// neither is one along x or y; one that passes a corner is, as a point. The points may have been
+/// moved also where nothing is left. Always 0.
 int32_t M_ClipLine2Rect(const M_FloatRect* rect, M_Vector2T<double>* p0, M_Vector2T<double>* p1,
                         unsigned char* visible);
 
@@ -484,9 +485,12 @@ bool M_TransformPoint2DtoScreen(const M_Matrix3& first, const M_Matrix3& second,
 /// *inside = whether the point lies in the polygon, for points of double and of float:
 ///
 ///   inside                                              1
-///   nearly on an edge that is not upright               1 (but 0 on a corner that is the leftmost)
+///   nearly on an edge that is not upright               1
 ///   on an upright edge, on the side of larger x         1
 ///   on an upright edge, on the side of smaller x        0
+///
+/// An edge's end at the smaller x is not part of it: a corner from which both edges lead to larger
+/// x is decided by the other edges, and 0 where it sticks out.
 ///
 /// With a tolerance (its sign does not matter) also what lies that close to a corner, or to an edge
 /// in the sense of M_PerpDistTo2DLine. A polygon whose points are all the same is that point. A
@@ -556,7 +560,9 @@ class M_TransformPoly3D {
   mutable bool polyPointsValid;  ///< polyPoints is the outline. It is empty where it is not.
 };
 
-/// The distance of a point from the nearest visible edge of a quad; -1 where there is none.
+/// The distance of a point from the nearest visible edge of a quad; -1 where there is none. It is
+/// that of M_PerpDistTo2DLine where that says the point is beside the edge, else that from the
+/// nearer end.
 template <class Poly>
 double M_GetMinimumEdgeDistance(const M_Vector2T<double>* point, const Poly& poly);
 
@@ -575,8 +581,8 @@ bool M_TransformPoint3DtoScreen(const M_Matrix4& toEye, const M_Matrix4& project
 // of M_Vector2T, M_Vector3T or M_Vector4T of double, and for hulls of qelcore::geom::PointT<float>.
 // ---------------------------------------------------------------------------------------------
 
-/// A point on the lattice of hulls: from 0 to 2^29 in each direction, or a little more where the
-/// steps are the smallest numbers there are.
+/// A point on the lattice of hulls: from 0 to 2^29 in each direction, or up to half as much again
+/// where the steps are the smallest numbers there are.
 struct M_LongPoint {
   int32_t x;
   int32_t y;

@@ -66,19 +66,19 @@ enum : uint32_t {
   M_SERVICE_GAUSS = 8,  ///< Not available: asking for it makes M_Birth fail.
 };
 
-/// All state of the library, 56 bytes. Clients only carry it from one copy of the library to
-/// another.
+/// All state of the library, 56 bytes on every machine. Clients only carry it from one copy of the
+/// library to another.
 struct M_Globals {
-  uint32_t birthMagic;         ///< M_LIFE_MAGIC while alive.
-  uint32_t services;           ///< Services whose set-up succeeded.
-  uint64_t reserved1;          ///< Carried along, never used.
-  U_Handle fcmTable;           ///< 256 x 256 bytes: multiply. Null before set-up.
-  U_Handle fcdTable;           ///< 256 x 256 bytes: divide. Null before set-up.
-  uint64_t reserved2;          ///< Carried along, never used.
-  U_Handle trigTable;          ///< 256 floats: quarter sine. Null before set-up.
-  uint32_t birthMagic2;        ///< M_LIFE_MAGIC while alive; alive means both.
-  uint16_t fcmdPrepareCount;   ///< Outstanding M_PrepareFCMD. Survives death and birth.
-  uint16_t ftrigPrepareCount;  ///< Outstanding M_PrepareFTrig. Survives death and birth.
+  uint32_t birthMagic;              ///< M_LIFE_MAGIC while alive.
+  uint32_t services;                ///< Services whose set-up succeeded.
+  uint64_t reserved1;               ///< Carried along, never used.
+  U_Handle fcmTable;                ///< 256 x 256 bytes: multiply. Null before set-up.
+  alignas(8) U_Handle fcdTable;     ///< 256 x 256 bytes: divide. Null before set-up.
+  alignas(8) uint64_t reserved2;    ///< Carried along, never used.
+  U_Handle trigTable;               ///< 256 floats: quarter sine. Null before set-up.
+  alignas(8) uint32_t birthMagic2;  ///< M_LIFE_MAGIC while alive; alive means both.
+  uint16_t fcmdPrepareCount;        ///< Outstanding M_PrepareFCMD. Survives death and birth.
+  uint16_t ftrigPrepareCount;       ///< Outstanding M_PrepareFTrig. Survives death and birth.
 };
 static_assert(sizeof(M_Globals) == 56);
 static_assert(offsetof(M_Globals, birthMagic) == 0 && offsetof(M_Globals, services) == 4);
@@ -116,8 +116,10 @@ int32_t M_SetGlobals(const M_Globals* in);
 // an outstanding prepare the tables stay where they are; without one the host may reclaim their
 // memory, and the next prepare makes them anew unless `noRebuild`. Tables that cannot be had:
 // with `reportIfUnavailable` the failure is reported, M_ERR_MEMORY returned and the tables are
-// null; without it 0 is returned, ready 0 and the tables' (null) data pointers. Each prepare that
-// does not return M_ERR_UNREQUESTED_SERVICE raises the count and owes one unprepare.
+// null; without it 0 is returned, ready 0 and the data pointers as they are, one of them null at
+// least. While another prepare is outstanding nothing is looked at: ready is 1 also where that one
+// got no tables, so the pointers are what to test. Each prepare that does not return
+// M_ERR_UNREQUESTED_SERVICE raises the count and owes one unprepare.
 // ---------------------------------------------------------------------------------------------
 
 /// Lends the quarter-wave sine table: 256 floats, entry i = sin(i / 255 * pi / 2).
@@ -154,12 +156,14 @@ extern "C" {
 /// sign gives 0x80000000; one that wraps to the right sign is returned. Never reports.
 M_Fixed M_FixMul(M_Fixed a, M_Fixed b);
 
-/// a / b, truncated; large dividends drop low bits of the divisor. A zero divisor (also after the
-/// drop) or a quotient of the wrong sign gives 0x80000000. Never reports.
+/// a / b, truncated; large dividends drop low bits of the divisor, which makes one of -32768 huge
+/// and the quotient 0. A zero divisor (also after the drop) or a quotient of the wrong sign gives
+/// 0x80000000. Never reports.
 M_Fixed M_FixDiv(M_Fixed a, M_Fixed b);
 
 /// a x b, halves away from zero. A product >= 128 or <= -129 reports M_ERR_OVERFLOW and gives
-/// 0x80000000; one between -129 and -128 gives 0x80000000 without a report.
+/// 0x80000000; one between -129 and -128, or that is rounded to 128, gives 0x80000000 without a
+/// report.
 M_Fix24 M_Fix24Mul(M_Fix24 a, M_Fix24 b);
 
 /// num / den of two integers in any common scale, rounded and bounded as M_Fix24Mul. den 0 reports
@@ -226,7 +230,8 @@ int32_t M_UnsignedLCM(uint32_t a, uint32_t b, uint32_t* out);
 /// The multiple of m (m > 0, or the behaviour is undefined) nearest to x, halves away from zero.
 int32_t M_RoundToNearestMult(int32_t x, int32_t m);
 
-/// d rounded, halves towards plus infinity. What does not fit, a NaN included, gives 0x80000000.
+/// d rounded by adding or subtracting 0.5 in double precision, halves towards plus infinity. What
+/// does not fit, a NaN included, gives 0x80000000.
 int32_t M_RoundDouble(double d);
 
 /// As M_RoundDouble, but what lies beyond either end gives 0x7FFFFFFF or 0x80000000.
@@ -268,12 +273,14 @@ int32_t M_ReduceRatio(const M_Ratio* in, M_Ratio* out, unsigned char* reduced);
 //   all bits set          (unsigned char*)-1, never dereferenced: approximates and halves unasked,
 //                         and reports only if even that fails
 // After every failure out is 0/0. out may be an operand. A zero denominator is always reported,
-// its code returned and the status byte left at 0.
+// its code returned and the status byte left at 0 (but M_DivRatio first finds a divisor that is too
+// large, and a halving stays in the byte). A b.num of -2^31 is its own negative where b is
+// subtracted, compared, or a limit.
 
 /// *out = a + b, over the least common denominator (not reduced), exact where it fits.
 int32_t M_AddRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned char* status);
 
-/// *out = a - b, as M_AddRatio. A b.num of -2^31 is its own negative.
+/// *out = a - b, as M_AddRatio.
 int32_t M_SubRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned char* status);
 
 /// *out = a x b, reduced only where it would not fit otherwise.
@@ -289,8 +296,9 @@ int32_t M_DivRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned ch
 /// cancels, in which case both fields were halved. A zero ratio gives 0/0. Always 0, no report.
 int32_t M_RecipRatio(const M_Ratio* in, M_Ratio* out, unsigned char* exact);
 
-/// *order < 0, = 0 or > 0 for a < b, a = b, a > b; only the sign counts. A b.num of -2^31 is its
-/// own negative. A zero denominator gives order 0 and is reported.
+/// *order < 0, = 0 or > 0 for a < b, a = b, a > b; only the sign counts. Where a den is 2^31 or
+/// more and the difference overflows, products are compared in double precision, in which close
+/// ratios may be equal. A zero denominator gives order 0 and is reported.
 int32_t M_CompareRatio(const M_Ratio* a, const M_Ratio* b, int32_t* order);
 
 /// *out = the smaller; a when they are equal. A zero denominator is reported and gives 0/0.
@@ -304,9 +312,9 @@ int32_t M_MaxRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out);
 int32_t M_FpLong2Ratio(M_Ratio* out, unsigned char* outOfRange, double x);
 
 /// *out = in over the denominator newDen, the numerator rounded as M_RoundDouble does; out may be
-/// in. `exact` receives whether nothing was lost. A numerator that leaves 32 bits gives 0/0 and
-/// sets `overflow`, or is reported where that is null. A zero denominator is reported, gives 0/0
-/// and leaves `exact` untouched.
+/// in. `exact` receives whether nothing was lost, as double precision sees it. A numerator that
+/// leaves 32 bits gives 0/0 and sets `overflow`, or is reported where that is null. A zero
+/// denominator is reported, gives 0/0 and leaves `exact` untouched.
 int32_t M_ConvRatio(const M_Ratio* in, uint32_t newDen, M_Ratio* out, unsigned char* exact,
                     unsigned char* overflow);
 

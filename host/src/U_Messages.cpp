@@ -18,13 +18,13 @@ namespace {
 // The layout in which a component hands over its messages.
 struct Entry {
   const char* key;
-  uint64_t cache[3];
+  alignas(8) uint64_t cache[3];
 };
 struct Header {
   const char* component;
-  uint64_t count;  // with the terminator
+  alignas(8) uint64_t count;  // with the terminator
   const Entry* table;
-  uint64_t reserved;
+  alignas(8) uint64_t reserved;
 };
 
 std::mutex folderMutex;

@@ -80,8 +80,9 @@ template <class Point>
 int32_t FindStraddling(const Point* poly, int32_t count, decltype(Point::x) x, int32_t* edges) {
   constexpr int32_t kBlock = 64;
   int32_t found = 0;
-  for (int32_t i = 0; i < count; i += kBlock) {
-    const int32_t size = std::min(count - i, kBlock);
+  int32_t size;
+  for (int32_t i = 0; i < count; i += size) {
+    size = std::min(count - i, kBlock);
     const uint64_t before = FindBefore(poly + i, size, x);
     const uint64_t last = poly[i + size < count ? i + size : 0].x < x;
     uint64_t changes = before ^ (before >> 1 | last << (size - 1));

@@ -55,23 +55,23 @@ enum : int16_t {
 /// One message. The host's string cache owns the three words behind the key.
 struct Mp_StrEntry {
   const char* key;
-  uint64_t cache[3];
+  alignas(8) uint64_t cache[3];
 };
 static_assert(sizeof(Mp_StrEntry) == 32 && offsetof(Mp_StrEntry, cache) == 8);
 
 /// What the host is handed to find a message.
 struct Mp_StrHeader {
   const char* component;
-  uint64_t count;  ///< Entries of the table, its terminator included.
+  alignas(8) uint64_t count;  ///< Entries of the table, its terminator included.
   Mp_StrEntry* table;
-  uint64_t reserved;
+  alignas(8) uint64_t reserved;
 };
 static_assert(sizeof(Mp_StrHeader) == 32 && offsetof(Mp_StrHeader, count) == 8);
 static_assert(offsetof(Mp_StrHeader, table) == 16 && offsetof(Mp_StrHeader, reserved) == 24);
 
 struct Mp_StrRef {
   Mp_StrHeader* header;
-  uint64_t reserved;
+  alignas(8) uint64_t reserved;
 };
 static_assert(sizeof(Mp_StrRef) == 16 && offsetof(Mp_StrRef, reserved) == 8);
 

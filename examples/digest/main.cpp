@@ -1,0 +1,105 @@
+// Prints a digest of the results of each area of the library, to see that a machine gives the bits
+// that others do.
+
+#include <cstdio>
+#include <cstring>
+#include <fstream>
+#include <map>
+#include <string>
+#include <thread>
+
+#include "Area.h"
+#include "U.h"
+
+namespace {
+
+using digest::AreaEntry;
+using digest::DigestOf;
+using digest::kAreaCount;
+using digest::kAreas;
+
+constexpr const char* kUsage =
+    "usage: digest [--threads N] [--compare FILE]\n"
+    "Prints a digest of what the functions of each area give for many operands.\n"
+    "  --threads N     also runs what is reentrant in N threads at once and compares\n"
+    "  --compare FILE  compares with digests that were printed before; what passes through the\n"
+    "                  platform's sines may differ, nothing else\n";
+
+std::string Hex(uint64_t value) {
+  char text[17];
+  std::snprintf(text, sizeof text, "%016llx", static_cast<unsigned long long>(value));
+  return text;
+}
+
+// The digests of a file, by area.
+std::map<std::string, std::string> Read(const char* path) {
+  std::map<std::string, std::string> digests;
+  std::ifstream file(path);
+  for (std::string line; std::getline(file, line);) {
+    const size_t space = line.find(' ');
+    if (space != std::string::npos) digests[line.substr(space + 1)] = line.substr(0, space);
+  }
+  return digests;
+}
+
+// False if one of many threads sees something else than this one has.
+bool AreThreadsAlike(int count, const uint64_t* expected) {
+  std::vector<int> differences(static_cast<size_t>(count), 0);
+  std::vector<std::thread> threads;
+  for (int& number : differences) {
+    threads.emplace_back([&number, expected] {
+      for (size_t i = 0; i < kAreaCount; ++i) {
+        if (kAreas[i].isReentrant) number += DigestOf(kAreas[i]) != expected[i];
+      }
+    });
+  }
+  for (std::thread& thread : threads) thread.join();
+  int sum = 0;
+  for (const int number : differences) sum += number;
+  return sum == 0;
+}
+
+int Run(int threads, const char* file) {
+  uint64_t digests[64];
+  for (size_t i = 0; i < kAreaCount; ++i) {
+    digests[i] = DigestOf(kAreas[i]);
+    std::printf("%s %s\n", Hex(digests[i]).c_str(), kAreas[i].name);
+  }
+  int status = 0;
+  if (threads > 0 && !AreThreadsAlike(threads, digests)) {
+    std::fprintf(stderr, "digest: threads give different results\n");
+    status = 1;
+  }
+  if (!file) return status;
+  const auto expected = Read(file);
+  for (size_t i = 0; i < kAreaCount; ++i) {
+    const auto line = expected.find(kAreas[i].name);
+    if (line != expected.end() && line->second == Hex(digests[i])) continue;
+    std::fprintf(stderr, "digest: %s differ%s\n", kAreas[i].name,
+                 kAreas[i].usesLibm ? ", as they may on another platform" : "");
+    if (!kAreas[i].usesLibm) status = 1;
+  }
+  return status;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  int threads = 0;
+  const char* file = nullptr;
+  for (int i = 1; i < argc; ++i) {
+    const bool hasValue = i + 1 < argc;
+    if (hasValue && std::strcmp(argv[i], "--threads") == 0) {
+      threads = std::atoi(argv[++i]);
+    } else if (hasValue && std::strcmp(argv[i], "--compare") == 0) {
+      file = argv[++i];
+    } else {
+      std::fputs(kUsage, stderr);
+      return 2;
+    }
+  }
+  U_SetLogCallback([](void*, int32_t, const char*, const char*, const char*) {}, nullptr);
+  if (M_Birth(M_SERVICE_TRIG | M_SERVICE_FCMD, nullptr) != 0) return 3;
+  const int status = Run(threads, file);
+  return M_Death() == 0 ? status : 3;
+}

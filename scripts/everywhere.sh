@@ -1,0 +1,71 @@
+# Sourced by check.sh: whether every compiler, optimisation, vector path and kind of library gives the same bits,
+# and other processors do.
+
+# Builds the digest program in build/everywhere/NAME and compares with what is recorded.
+#   everywhere_one NAME COMPILER FLAGS RUNNER CMAKE-ARGUMENTS...
+everywhere_one() {
+  name=$1
+  compiler=$2
+  flags=$3
+  runner=$4
+  shift 4
+  folder=build/everywhere/$name
+  log=build/everywhere/$name.log
+  mkdir -p build/everywhere
+  {
+    cmake -S . -B "$folder" -G Ninja -DCMAKE_BUILD_TYPE=None -DCMAKE_CXX_COMPILER="$compiler" \
+      -DCMAKE_CXX_FLAGS="$flags" -DM_BUILD_EXAMPLES=OFF -DM_BUILD_TESTS=OFF -DM_BUILD_BENCH=OFF "$@" &&
+      cmake --build "$folder" -j 2
+  } >"$log" 2>&1 || {
+    cat "$log"
+    echo "The build of $name failed."
+    return 1
+  }
+  if LC_ALL=C $runner "$folder/bin/digest" --compare examples/digest/expected.txt >"$folder.digests" 2>"$folder.differences"; then
+    result='the same'
+  else
+    result=DIFFERENT
+    everywhere_failures=$((everywhere_failures + 1))
+  fi
+  libm=$(grep -c 'as they may' "$folder.differences" || true)
+  printf '%-32s %s' "$name" "$result"
+  if [ "$libm" -gt 0 ]; then printf ', but for %s libm areas' "$libm"; fi
+  echo
+  grep -v 'as they may' "$folder.differences" || true
+}
+
+everywhere() {
+  need_packages g++ clang cmake ninja-build gettext
+  everywhere_failures=0
+  for compiler in g++ clang++; do
+    for optimised in -O0 -O2 -O3; do
+      flags=$optimised
+      [ $optimised != -O3 ] || flags='-O3 -march=native'
+      for shared in ON OFF; do
+        for baseline in OFF ON; do
+          name=$compiler$optimised
+          [ $optimised != -O3 ] || name=$name-native
+          [ $shared = ON ] && name=$name-shared || name=$name-static
+          [ $baseline = ON ] && name=$name-baseline || name=$name-widest
+          everywhere_one "$name" $compiler "$flags" '' \
+            -DBUILD_SHARED_LIBS=$shared -DM_BASELINE_VECTORS=$baseline
+        done
+      done
+    done
+  done
+  need_packages qemu-user g++-aarch64-linux-gnu g++-s390x-linux-gnu g++-i686-linux-gnu
+  for optimised in -O0 -O2 -O3; do
+    for machine in aarch64 s390x i686; do
+      flags=$optimised
+      emulator=qemu-$machine
+      # 32 bits, with the arithmetic of SSE2.
+      [ $machine != i686 ] || flags="$optimised -msse2 -mfpmath=sse" emulator=qemu-i386
+      everywhere_one $machine$optimised $machine-linux-gnu-g++ "$flags" "$emulator -L /usr/$machine-linux-gnu" \
+        -DCMAKE_SYSTEM_NAME=Linux -DCMAKE_SYSTEM_PROCESSOR=$machine
+    done
+  done
+  if [ "$everywhere_failures" -gt 0 ]; then
+    echo "$everywhere_failures builds give other bits."
+    return 1
+  fi
+}
