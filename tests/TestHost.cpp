@@ -37,9 +37,15 @@ U_Handle Allocate(size_t bytes) {
 
 void* operator new(size_t bytes) {
   ++host.news;
-  void* const block = std::exchange(host.failsNextNew, false) ? nullptr : std::malloc(bytes);
+  const bool fails = host.newToFail > 0 && --host.newToFail == 0;
+  void* const block = fails ? nullptr : std::malloc(bytes);
   if (!block) throw std::bad_alloc();
+  ++host.blocks;
   return block;
+}
+void operator delete(void* block) noexcept {
+  if (block) --host.blocks;
+  std::free(block);
 }
 void* U_MemTrackedObject::TrackedNew(size_t bytes, bool) {
   ++host.trackedBlocks;
@@ -52,10 +58,9 @@ void U_MemTrackedObject::TrackedDelete(void* block) {
 
 // Named, too, because a sanitizer's own does not come here.
 void* operator new[](size_t bytes) { return operator new(bytes); }
-void operator delete[](void* block) noexcept { std::free(block); }
-void operator delete[](void* block, size_t) noexcept { std::free(block); }
-void operator delete(void* block) noexcept { std::free(block); }
-void operator delete(void* block, size_t) noexcept { std::free(block); }
+void operator delete[](void* block) noexcept { operator delete(block); }
+void operator delete[](void* block, size_t) noexcept { operator delete(block); }
+void operator delete(void* block, size_t) noexcept { operator delete(block); }
 
 extern "C" {
 

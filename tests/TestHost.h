@@ -20,7 +20,8 @@ struct TestHost {
   int trackedBlocks = 0;           ///< Tracked blocks not freed.
   size_t trackedBytes = 0;         ///< Of the last one.
   int news = 0;                    ///< Calls of operator new.
-  bool failsNextNew = false;       ///< Whether the next one fails.
+  int newToFail = 0;               ///< Which of the next ones fails; 0 for none.
+  int blocks = 0;                  ///< Blocks of operator new not freed.
   int32_t reportResult = 0;        ///< What reports with a host error return; 0: the host error.
   std::vector<std::string> Take() { return std::exchange(calls, {}); }
 };

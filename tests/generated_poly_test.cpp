@@ -2,6 +2,7 @@
 // what is allocated.
 
 #include <cmath>
+#include <functional>
 #include <numbers>
 
 #include "Generator.h"
@@ -70,35 +71,62 @@ std::vector<V2> PlainHull(const std::vector<V2>& points) {
 
 TEST_F(Polygons, HullsAreThoseOfThePlainScan) {
   for (int round = 0; round < 3000; ++round) {
-    // Small sets on few places, and large ones of several shapes, some with points far away.
-    const bool isLarge = round % 60 == 0;
-    const auto count =
-        static_cast<int32_t>(isLarge ? 1000 + generator_.Below(5000) : 4 + generator_.Below(20));
-    const int32_t shape = round / 60 % 6, grid = 1 + round % 5;
-    std::vector<V2> points(static_cast<size_t>(count));
+    // Small sets on few places, and others of several shapes, some with a point far away.
+    const bool isSmall = round % 3 != 0;
+    const int32_t shape = round / 3 % 7, grid = 1 + round % 5;
+    std::vector<V2> points(static_cast<size_t>(isSmall           ? 4 + generator_.Below(20)
+                                               : round % 60 == 0 ? 1000 + generator_.Below(5000)
+                                                                 : 32 + generator_.Below(300)));
+    const V2 middle = {Uniform(generator_.OneOf({0.0, 4.0, 1e6})),
+                       Uniform(generator_.OneOf({1e-4, 4.0}))};
+    const double slope = shape < 4 && generator_.Below(2) ? Uniform(2) : 0,
+                 flat = generator_.OneOf({1.0, 1e-4}), tilt = generator_.OneOf({0.0, 1e-8, 1e-7});
+    const bool isUpright = generator_.Below(2);
+    uint32_t side = 0;
     for (V2& p : points) {
-      const double angle = Uniform(std::numbers::pi),
-                   r = shape == 1 ? 1 : std::sqrt(std::abs(Uniform(1)));
-      if (!isLarge) {
+      // At times exactly at an end.
+      const double u = std::clamp(Uniform(1.2), -1.0, 1.0), v = Uniform(1),
+                   angle = v * std::numbers::pi, r = shape == 1 ? 1 : std::sqrt(std::abs(u));
+      if (generator_.Below(20) == 0) side = generator_.Below(4);
+      if (isSmall) {
         p = {static_cast<double>(generator_.Small(grid)),
              static_cast<double>(generator_.Small(grid))};
-      } else if (shape < 3) {
-        p = {r * std::cos(angle) * 3 + 1e6, r * std::sin(angle)};
-      } else {
-        p = {Uniform(1) + Uniform(1), shape == 4 ? 0.25 : Uniform(1)};
+        continue;
       }
+      if (shape < 2) {
+        p = {r * std::cos(angle) * 3, r * std::sin(angle)};
+      } else if (shape == 2) {
+        p = {u + v, Uniform(1)};
+      } else if (shape == 3) {  // The outline of a triangle, and of a rectangle.
+        p = side == 0   ? V2{u, -0.55 - 0.25 * u}
+            : side == 1 ? V2{0.65 - 0.35 * u, 0.1 + 0.9 * u}
+                        : V2{-0.35 + 0.65 * u, 0.35 + 0.65 * u};
+      } else if (shape == 4) {
+        const double far = (side < 2 ? 1 : -1) * (1 - 2e-9 * std::abs(v)) + tilt * u;
+        p = side % 2 == 0 ? V2{u, far} : V2{far, u};
+      } else {
+        p = isUpright ? V2{0.25, shape == 5 ? u : 0.5} : V2{u, shape == 5 ? 0.25 : v};
+      }
+      p = {p.x + middle.x, p.y * flat + p.x * slope + middle.y};
     }
-    if (isLarge && shape == 2) points[static_cast<size_t>(count) / 2] = {1e12, -1e9};
-    if (isLarge && shape == 5) points.resize(2048, {0, 0});
+    if (!isSmall && shape == 6 && !isUpright) points.resize(2048, {0, 0});
+    if (!isSmall && generator_.Below(2)) {
+      points.back() = {generator_.OneOf({0.0, 2e9, -1e9}), generator_.OneOf({0.0, 1e9, -2e9})};
+    }
     // Where products overflow, vanish, or steps are the smallest numbers.
     const double scale = generator_.OneOf({1.0, 1.0, 1.0, 1e154, 1e-160, 1e-308});
     for (V2& p : points) p = {p.x * scale, p.y * scale};
     std::vector<V2> hull;
     M_ComputeConvexHull(points.cbegin(), points.cend(), hull);
+    std::vector<V4> fours;
+    for (const V2& p : points) fours.push_back({p.x, p.y, 1, 1});
+    M_ComputeConvexHull(fours.cbegin(), fours.cend(), fours);
     const std::vector<V2> plain = PlainHull(points);
     ASSERT_EQ(hull.size(), plain.size()) << round;
+    ASSERT_EQ(fours.size(), plain.size()) << round;
     for (size_t i = 0; i < hull.size(); ++i) {
       ASSERT_TRUE(hull[i].x == plain[i].x && hull[i].y == plain[i].y) << round << ' ' << i;
+      ASSERT_TRUE(fours[i].x == plain[i].x && fours[i].y == plain[i].y) << round << ' ' << i;
     }
   }
 }
@@ -152,7 +180,7 @@ TEST_F(Polygons, NoMemoryIsTheHostsToReport) {
   unsigned char inside = 9;
   ASSERT_EQ(M_IsFloatPointInConcavePoly(&p, star.data(), 64, 9.0, &inside), 0);
   ASSERT_EQ(inside, 1);
-  host.failsNextNew = true;
+  host.newToFail = 1;
   EXPECT_EQ(M_IsFloatPointInConcavePoly(&p, star.data(), 65, 9.0, &inside), 79);
   EXPECT_EQ(inside, 0);
   EXPECT_EQ(host.Take(), Calls{"exception std::bad_alloc"});
@@ -170,6 +198,43 @@ TEST_F(Polygons, NoMemoryIsTheHostsToReport) {
     }
   }
   EXPECT_EQ(host.trackedBlocks, 0);
+}
+
+// Whichever allocation fails, what there was is still there, and nothing is lost.
+TEST_F(Polygons, FailedAllocationsChangeNothing) {
+  const std::vector<V2> few = Star(50), many = Star(5000);
+  const std::vector<V4> none, clipper = {{-2, -2, 0, 0}, {2, -2, 0, 0}, {0, 2, 0, 0}};
+  std::vector<V4> subject;
+  for (const V2& p : few) subject.push_back({p.x, p.y, 0, 0});
+  std::vector<V2> hull;
+  std::vector<V4> clipped;
+  const std::function<void()> works[] = {
+      [&] { M_ComputeConvexHull(few.cbegin(), few.cbegin() + 3, hull); },
+      [&] { M_ComputeConvexHull(few.cbegin(), few.cend(), hull); },
+      [&] { M_ComputeConvexHull(many.data(), many.data() + many.size(), hull); },
+      [&] { M_PolyPolyClip2D(&clipper, &subject, &clipped); },
+      [&] { M_PolyPolyClip2D(&none, &subject, &clipped); },
+  };
+  for (const auto& work : works) {
+    bool fails = true;
+    int allocation = 0;
+    while (fails) {
+      ASSERT_LT(++allocation, 60);
+      hull.assign(1, {9, 9});
+      clipped.assign(1, {9, 9, 9, 9});
+      const int blocks = host.blocks;
+      host.newToFail = allocation;
+      try {
+        work();
+        fails = false;
+      } catch (const std::bad_alloc&) {
+        EXPECT_EQ(host.blocks, blocks);
+        EXPECT_TRUE(hull.size() == 1 && hull[0].x == 9 && clipped.size() == 1);
+      }
+    }
+    EXPECT_GT(allocation, 1);
+    host.newToFail = 0;
+  }
 }
 
 double Area(const std::vector<V4>& polygon) {

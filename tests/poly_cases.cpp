@@ -152,6 +152,11 @@ const Operation kNewQuad("NewQuad", [](Arguments& in) {
   EXPECT_EQ(quad->polyPoints.capacity(), 0u);
   EXPECT_FALSE(quad->polyPointsValid);
   for (unsigned char flag : quad->clipped) EXPECT_EQ(flag, 0);
+  for (size_t seen = 0; seen < 4; ++seen) {
+    for (size_t i = 0; i < 4; ++i) quad->clipped[i] = i != seen;
+    EXPECT_TRUE(quad->IsVisible());
+  }
+  std::fill_n(quad->clipped, 4, 0);
   if (in.IsEmpty()) delete std::exchange(quad, nullptr);
   for (size_t i = 0; quad && i < 4; ++i) quad->points[i] = Read<V3>(in);
   return Outcome(0);
