@@ -29,7 +29,7 @@ case ${1-} in
 esac
 
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libbenchmark-dev pkg-config \
-  binutils clang clang-format clang-tidy abigail-tools
+  binutils clang clang-format clang-tidy abigail-tools gdb perl
 
 echo "Checking the format ..."
 find include src host examples tests bench -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror

@@ -53,6 +53,7 @@
 /// A point or vector in the plane.
 template <class T>
 struct M_Vector2T {
+  /// To the right, and downwards, where nothing else is said.
   T x;
   T y;
 };
@@ -61,6 +62,7 @@ static_assert(sizeof(M_Vector2T<double>) == 16 && offsetof(M_Vector2T<double>, y
 /// A point or vector in space, or a homogeneous point of the plane.
 template <class T>
 struct M_Vector3T {
+  /// To the right, downwards and away from the viewer, where nothing else is said.
   T x;
   T y;
   T z;
@@ -71,6 +73,7 @@ static_assert(offsetof(M_Vector3T<double>, z) == 16);
 /// A homogeneous point of space, or a direction where w is 0.
 template <class T>
 struct M_Vector4T {
+  /// As of M_Vector3T, and what these are divided by.
   T x;
   T y;
   T z;
@@ -93,6 +96,7 @@ void M_Vector4T<double>::Normalize();
 
 /// Nine doubles, row by row: a transform of (x, y, 1) with the translation in m[2].
 struct M_Matrix3 {
+  /// By row and column.
   double m[3][3];
 
   /// *p := (p x M) / w', each component divided, with z then 1. Throws M_ERR_W_IS_ZERO, after a
@@ -113,12 +117,16 @@ struct M_Matrix3 {
   /// Whether no element differs from the identity's by more than eps. A NaN passes.
   bool IsIdentityWithinEpsilon(double eps) const;
 
+  /// Swaps rows and columns.
   void Transpose();
+
+  /// By the first row.
   double Determinant() const;
 
   /// Makes this its adjugate: M x adj(M) = det(M) I.
   void Adjoint();
 
+  /// Element by element.
   M_Matrix3& operator+=(const M_Matrix3& other);
   M_Matrix3& operator-=(const M_Matrix3& other);
 
@@ -133,6 +141,7 @@ static_assert(sizeof(M_Matrix3) == 72);
 
 /// Sixteen doubles, row by row: a transform of (x, y, z, w) with the translation in m[3].
 struct M_Matrix4 {
+  /// By row and column.
   double m[4][4];
 
   /// *p := (p x M) x (1 / w'), with w then 1. Throws M_ERR_W_IS_ZERO, after a report, when w'
@@ -160,17 +169,20 @@ struct M_Matrix4 {
   /// 0 is not looked for.
   void Project(double d);
 
+  /// Swaps rows and columns.
   void Transpose();
 
+  /// Element by element.
   M_Matrix4& operator+=(const M_Matrix4& other);
   M_Matrix4& operator-=(const M_Matrix4& other);
 };
 static_assert(sizeof(M_Matrix4) == 128);
 
 // ---------------------------------------------------------------------------------------------
-// Comparison within a tolerance: whether no two elements differ by more than eps. A NaN passes.
+// Comparison within a tolerance. A NaN passes.
 // ---------------------------------------------------------------------------------------------
 
+/// Whether no two elements differ by more than eps.
 bool M_EqualMatrixWithinEpsilon(const M_Matrix3& a, const M_Matrix3& b, double eps);
 bool M_EqualMatrixWithinEpsilon(const M_Matrix4& a, const M_Matrix4& b, double eps);
 
@@ -290,10 +302,10 @@ static_assert(sizeof(M_Shear) == 24);
 
 /// A matrix taken apart.
 struct M_Matrix4Decomp {
-  M_Vector3T<double> translate;
-  M_Vector3T<double> scale;  ///< Lengths of the rows without shear; all negative for a mirror.
-  M_Shear shear;
-  M_Vector3T<double> rotate;  ///< Radians.
+  M_Vector3T<double> translate;  ///< The last row.
+  M_Vector3T<double> scale;      ///< Lengths of the rows without shear; all negative for a mirror.
+  M_Shear shear;                 ///< Of one row on another.
+  M_Vector3T<double> rotate;     ///< Radians.
 };
 static_assert(sizeof(M_Matrix4Decomp) == 96 && offsetof(M_Matrix4Decomp, scale) == 24);
 static_assert(offsetof(M_Matrix4Decomp, shear) == 48 && offsetof(M_Matrix4Decomp, rotate) == 72);
@@ -367,6 +379,7 @@ int32_t M_Slerp(const double* q0, const double* q1, double* out, double t);
 
 /// The plane a x + b y + c z + d = 0.
 struct M_PlaneEq {
+  /// The coefficients of x, y and z, and the constant.
   double a;
   double b;
   double c;
@@ -374,8 +387,9 @@ struct M_PlaneEq {
 };
 static_assert(sizeof(M_PlaneEq) == 32 && offsetof(M_PlaneEq, d) == 24);
 
-/// From a point in a direction. The ws are not looked at.
+/// From a point in a direction.
 struct M_Ray {
+  /// Homogeneous, with a w that is not looked at.
   M_Vector4T<double> origin;
   M_Vector4T<double> direction;
 };
@@ -431,11 +445,13 @@ int32_t M_ClipLine2Rect(const M_FloatRect* rect, M_Vector2T<double>* p0, M_Vecto
 
 /// What a matrix makes of the directions x and y.
 struct M_DirectionalComponents {
+  /// The images of (1, 0) and of (0, 1).
   M_Vector2T<double> x;
   M_Vector2T<double> y;
 };
 static_assert(sizeof(M_DirectionalComponents) == 32);
 
+/// What m makes of the directions x and y; translation does not matter.
 M_DirectionalComponents M_ComputeDirectionalComponents(const M_Matrix3& m);
 
 /// The bearing of a vector; 90 for the zero vector.
@@ -514,8 +530,8 @@ class M_TransformPoly2D {
   bool IsPointInside(const M_Vector2T<double>* point, double tolerance) const;
   double GetMinimumEdgeDistance(const M_Vector2T<double>* point) const;
 
-  M_Vector2T<double> points[4];
-  bool visible;
+  M_Vector2T<double> points[4];  ///< The corners, in order.
+  bool visible;                  ///< Set by the client.
 };
 
 /// A quad in space on its way to the screen. Fill in `points`; then TransformPointsToEye,
@@ -527,6 +543,7 @@ class M_TransformPoly3D {
   M_TransformPoly3D();  ///< Nothing clipped, no outline; the corners are left unset.
   virtual ~M_TransformPoly3D();
 
+  /// Takes the corners to where the eye sees them.
   void TransformPointsToEye(const M_Matrix4& toEye);
 
   /// Clips the edges to the near plane, z >= 0.1, and takes corners and crossings to the screen.
@@ -535,6 +552,7 @@ class M_TransformPoly3D {
   /// Clips one edge, as it stands. The outline is left alone.
   void ClipEdgeToScreen(int edge);
 
+  /// Drops the outline.
   void InvalidatePolyPoints();
 
   /// Makes the outline of what is visible, unless there is one.
@@ -546,8 +564,9 @@ class M_TransformPoly3D {
   bool GetPoint(int corner, M_Vector2T<double>* out) const;
   bool GetEdge(int edge, std::pair<M_Vector2T<double>, M_Vector2T<double>>* out) const;
 
+  /// The outline as it is. The index is not checked.
   int NumPolyPoints() const;
-  void GetPolyPoint(int index, M_Vector2T<double>* out) const;  ///< Not checked.
+  void GetPolyPoint(int index, M_Vector2T<double>* out) const;
 
   /// As M_IsFloatPointInConcavePoly for the outline as it is; false where there is none.
   bool IsPointInside(const M_Vector2T<double>* point, double tolerance) const;
@@ -556,6 +575,7 @@ class M_TransformPoly3D {
   M_Vector3T<double> points[4];      ///< In the world, then as the eye sees them, then on screen.
   M_Vector3T<double> clipPoints[4];  ///< Where edges cross the near plane.
   unsigned char clipped[4];          ///< Corners before the near plane.
+  /// The outline of what is visible, or nothing.
   mutable std::vector<M_Vector2T<double>, U_Allocator<M_Vector2T<double>>> polyPoints;
   mutable bool polyPointsValid;  ///< polyPoints is the outline. It is empty where it is not.
 };
@@ -577,13 +597,14 @@ bool M_TransformPoint3DtoScreen(const M_Matrix4& toEye, const M_Matrix4& project
                                 const M_Matrix3& toScreen, M_Vector2T<double>* point);
 
 // ---------------------------------------------------------------------------------------------
-// Convexity and hulls, by x and y. The ranges are const iterators of a vector, or const pointers,
+// Hulls and convexity. By x and y. The ranges are const iterators of a vector, or const pointers,
 // of M_Vector2T, M_Vector3T or M_Vector4T of double, and for hulls of qelcore::geom::PointT<float>.
 // ---------------------------------------------------------------------------------------------
 
 /// A point on the lattice of hulls: from 0 to 2^29 in each direction, or up to half as much again
 /// where the steps are the smallest numbers there are.
 struct M_LongPoint {
+  /// Steps from the least coordinate of the axis.
   int32_t x;
   int32_t y;
 };

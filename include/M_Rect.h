@@ -50,6 +50,7 @@ struct M_Vector4T;
 
 /// A 16-bit point. May alias, because M_TopLeft and M_BottomRight show halves of an M_Rect as one.
 struct [[gnu::may_alias]] M_Point {
+  /// Downwards, and to the right.
   int16_t v;
   int16_t h;
 };
@@ -57,6 +58,7 @@ static_assert(sizeof(M_Point) == 4 && offsetof(M_Point, v) == 0 && offsetof(M_Po
 
 /// A 32-bit point.
 struct M_LPoint {
+  /// To the right, and downwards.
   int32_t h;
   int32_t v;
 };
@@ -64,6 +66,7 @@ static_assert(sizeof(M_LPoint) == 8 && offsetof(M_LPoint, h) == 0 && offsetof(M_
 
 /// A 16.16 point.
 struct M_FixedPoint {
+  /// To the right, and downwards.
   M_Fixed h;
   M_Fixed v;
 };
@@ -72,6 +75,7 @@ static_assert(offsetof(M_FixedPoint, h) == 0 && offsetof(M_FixedPoint, v) == 4);
 
 /// A 16-bit rectangle: its top left point, then its bottom right one.
 struct M_Rect {
+  /// The first row and column inside, then the first ones beyond.
   int16_t top;
   int16_t left;
   int16_t bottom;
@@ -82,6 +86,7 @@ static_assert(offsetof(M_Rect, bottom) == 4 && offsetof(M_Rect, right) == 6);
 
 /// A 32-bit rectangle.
 struct M_LRect {
+  /// The first column and row inside, then the first ones beyond.
   int32_t left;
   int32_t top;
   int32_t right;
@@ -92,6 +97,7 @@ static_assert(offsetof(M_LRect, right) == 8 && offsetof(M_LRect, bottom) == 12);
 
 /// A 16.16 rectangle.
 struct M_FixedRect {
+  /// The edges that are inside, then those that are not.
   M_Fixed left;
   M_Fixed top;
   M_Fixed right;
@@ -103,6 +109,7 @@ static_assert(offsetof(M_FixedRect, right) == 8 && offsetof(M_FixedRect, bottom)
 
 /// A rectangle of doubles.
 struct M_FloatRect {
+  /// The edges that are inside, then those that are not.
   double left;
   double top;
   double right;
@@ -114,6 +121,7 @@ static_assert(offsetof(M_FloatRect, right) == 16 && offsetof(M_FloatRect, bottom
 
 /// Four 16-bit values that clients agree on; the library sets, copies and compares them.
 struct M_WHRect {
+  /// In the order of M_SetWHRect.
   int16_t values[4];
 };
 static_assert(sizeof(M_WHRect) == 8);
@@ -273,7 +281,7 @@ int32_t M_LRect2FixedRect(const M_LRect* from, M_FixedRect* to);
 int32_t M_LRect2Rect(const M_LRect* from, M_Rect* to);
 
 // ---------------------------------------------------------------------------------------------
-// Transformed points and vectors, in place. Row vectors, translation in the last row. A count
+// Transformed points and vectors. In place. Row vectors, translation in the last row. A count
 // below 1 does nothing. The matrix must not lie among the points.
 //
 // The same bits come out whether points are given one by one or many at once, NaNs included, and on

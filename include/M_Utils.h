@@ -252,6 +252,7 @@ double M_fmod(double x, double y);
 /// num / den. The sign is num's; den is unsigned and must not be 0. Not kept in lowest terms: a
 /// result is reduced only where that avoids an overflow.
 struct M_Ratio {
+  /// The numerator with the sign, and the denominator.
   int32_t num;
   uint32_t den;
 };

@@ -41,6 +41,7 @@ const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t, int32
 /// U_ZLookupLStrCache with any other filled in.
 char* Up_GetThreadLoggingBuffer(void);
 
+/// Sets the calling thread's last error.
 void Up_SetThreadLastError(int32_t error);
 
 /// Reports the message in the thread's buffer. The last error becomes the identifier, which is
@@ -74,23 +75,28 @@ struct U_MemTrackedObject {
 template <class T>
 class U_Allocator {
  public:
-  using value_type = T;
+  using value_type = T;  ///< As the standard wants it.
 
+  /// All are alike.
   U_Allocator() = default;
   template <class Other>
   U_Allocator(const U_Allocator<Other>&) {}
 
+  /// Room for so many, or std::bad_alloc.
   T* allocate(size_t count) {
     if (count > SIZE_MAX / sizeof(T)) count = SIZE_MAX / sizeof(T);
     return static_cast<T*>(U_MemTrackedObject::TrackedNew(count * sizeof(T), false));
   }
+  /// Gives it back.
   void deallocate(T* block, size_t) { U_MemTrackedObject::TrackedDelete(block); }
 };
 
+/// All are equal.
 template <class T, class Other>
 bool operator==(const U_Allocator<T>&, const U_Allocator<Other>&) {
   return true;
 }
+/// None differs from another.
 template <class T, class Other>
 bool operator!=(const U_Allocator<T>&, const U_Allocator<Other>&) {
   return false;
@@ -105,13 +111,15 @@ extern "C" {
 /// Reclaims a handle's block: its data pointer becomes null, the handle stays.
 void U_ReclaimHandle(U_Handle handle);
 
-/// What is allocated at this moment. Reclaimed blocks count as handles of 0 bytes.
+/// What is allocated. Reclaimed blocks count as handles of 0 bytes.
 struct U_MemoryUse {
+  /// Numbers and sizes of what is not freed.
   size_t handles;
   size_t handleBytes;
   size_t trackedBlocks;
   size_t trackedBytes;
 };
+/// What is allocated at this moment.
 U_MemoryUse U_GetMemoryUse(void);
 
 /// The calling thread's last error: 0, an identifier or a host error number.
@@ -119,6 +127,7 @@ int32_t Up_GetThreadLastError(void);
 
 /// One report. `hostError` is 0 where there is none, `text` never null.
 struct U_Report {
+  /// As the report was made; the text in the user's language.
   uint32_t id;
   int32_t severity;
   int32_t hostError;

@@ -1,0 +1,14 @@
+#!/bin/sh
+# Compiles and runs the examples of the reference: each prints what its comments with an arrow say, and returns 0.
+# Usage: reference.sh SOURCE_FOLDER LIBRARY_FOLDER COMPILER
+set -eu
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+for example in "$1"/examples/reference/*.cpp; do
+  "$3" -std=c++17 -Wall -Wextra -Wpedantic -Werror -I "$1/include" -I "$1/host/include" "$example" -o "$work/example" \
+    -L"$2" -Wl,-rpath,"$2" -lM -lMHost
+  sed -nE 's/^.*;  +\/\/ -> (.*)$/\1/p' "$example" >"$work/expected"
+  "$work/example" >"$work/printed" 2>/dev/null || { echo "$example fails"; exit 1; }
+  diff "$work/expected" "$work/printed" || { echo "$example: < expected, > printed"; failed=1; }
+done
+[ -z "${failed-}" ]
