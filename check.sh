@@ -1,7 +1,7 @@
 #!/bin/sh
 # Installs what is missing, builds, and runs every test.
 # --all: also with clang++ and clang-tidy, with the sanitizers, as a static library with baseline vectors
-# only, and unoptimised.
+# only, and unoptimised; makes the reference, and fuzzes for a moment.
 # --everywhere: instead, whether all builds on all processors give the same bits.
 # --fuzz SECONDS: instead, the fuzz targets, each for so long.
 set -eu
@@ -44,3 +44,9 @@ for preset in $presets; do
       clang-tidy --quiet --warnings-as-errors='*' -p "build/$preset" 2>/dev/null
   fi
 done
+
+if [ "$presets" != release ]; then
+  ./docs.sh
+  . scripts/fuzz.sh
+  fuzz 8
+fi

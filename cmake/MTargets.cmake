@@ -28,7 +28,9 @@ function(m_install_library name folder)
     target_sources(${name} PUBLIC FILE_SET HEADERS FILES ${folder}/${header})
   endforeach()
   install(TARGETS ${name} EXPORT MTargets
-    FILE_SET HEADERS DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/M)
+    LIBRARY COMPONENT runtime NAMELINK_COMPONENT development
+    ARCHIVE COMPONENT development
+    FILE_SET HEADERS DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/M COMPONENT development)
 endfunction()
 
 function(m_link_with_script name flag script)
@@ -39,13 +41,13 @@ endfunction()
 
 function(m_install_package)
   set(folder ${CMAKE_INSTALL_LIBDIR}/cmake/M)
-  install(EXPORT MTargets NAMESPACE M:: DESTINATION ${folder})
+  install(EXPORT MTargets NAMESPACE M:: DESTINATION ${folder} COMPONENT development)
   configure_package_config_file(cmake/MConfig.cmake.in ${PROJECT_BINARY_DIR}/MConfig.cmake
     INSTALL_DESTINATION ${folder} NO_SET_AND_CHECK_MACRO)
   write_basic_package_version_file(${PROJECT_BINARY_DIR}/MConfigVersion.cmake
     COMPATIBILITY SameMajorVersion)
   install(FILES ${PROJECT_BINARY_DIR}/MConfig.cmake ${PROJECT_BINARY_DIR}/MConfigVersion.cmake
-    DESTINATION ${folder})
+    DESTINATION ${folder} COMPONENT development)
 
   set(pc_folder ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
   # Relative, so that an installed tree can be moved.
@@ -57,5 +59,12 @@ function(m_install_package)
     set(pc_libs "-L\${libdir} -lM -lMHost")
   endif()
   configure_file(cmake/M.pc.in ${PROJECT_BINARY_DIR}/M.pc @ONLY)
-  install(FILES ${PROJECT_BINARY_DIR}/M.pc DESTINATION ${pc_folder})
+  install(FILES ${PROJECT_BINARY_DIR}/M.pc DESTINATION ${pc_folder} COMPONENT development)
+
+  # gdb finds it by the library's place on the disk.
+  if(BUILD_SHARED_LIBS AND NOT APPLE)
+    install(FILES src/pkg/M/linux/libM-gdb.py
+      DESTINATION ${CMAKE_INSTALL_DATADIR}/gdb/auto-load${CMAKE_INSTALL_FULL_LIBDIR}
+      RENAME libM.so.${PROJECT_VERSION}-gdb.py COMPONENT runtime)
+  endif()
 endfunction()
