@@ -32,7 +32,7 @@ need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libb
   binutils clang clang-format clang-tidy abigail-tools gdb perl
 
 echo "Checking the format ..."
-find include src host examples tests bench -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror
+find include src host examples tests bench fuzz -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror
 
 for preset in $presets; do
   build_preset "$preset"
@@ -40,7 +40,7 @@ for preset in $presets; do
   ctest --preset "$preset" --progress
   if [ "$preset" = clang ]; then
     echo "Reading with clang-tidy ..."
-    find src host examples/comp -name '*.cpp' | xargs -n 1 -P 2 \
+    find src host examples/comp examples/digest -name '*.cpp' | xargs -n 1 -P 2 \
       clang-tidy --quiet --warnings-as-errors='*' -p "build/$preset" 2>/dev/null
   fi
 done

@@ -67,20 +67,11 @@ std::string NearElements(const Record& record, double unit = 1e9) {
   for (double& element : elements) element = std::round(element * unit) / unit + 0.0;
   return List(elements);
 }
-inline std::string ToText(const M_Matrix3& m) { return Elements(m); }
-inline std::string ToText(const M_Matrix4& m) { return Elements(m); }
-template <class T>
-std::string ToText(const M_Vector2T<T>& v) {
-  return Elements(v);
+template <class Record>
+requires requires(Record r) { r.m; } || requires(Record r) {
+  r.x;
 }
-template <class T>
-std::string ToText(const M_Vector3T<T>& v) {
-  return Elements(v);
-}
-template <class T>
-std::string ToText(const M_Vector4T<T>& v) {
-  return Elements(v);
-}
+std::string ToText(const Record& record) { return Elements(record); }
 
 template <class Record>
 Record Read(Arguments& in) {

@@ -5,7 +5,7 @@ set -eu
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 for example in "$1"/examples/reference/*.cpp; do
-  "$3" -std=c++17 -Wall -Wextra -Wpedantic -Werror -I "$1/include" -I "$1/host/include" "$example" -o "$work/example" \
+  "$3" -std=c++17 -Wall -Wextra -Wpedantic -Werror -isystem "$1/include" -isystem "$1/host/include" "$example" -o "$work/example" \
     -L"$2" -Wl,-rpath,"$2" -lM -lMHost
   sed -nE 's/^.*;  +\/\/ -> (.*)$/\1/p' "$example" >"$work/expected"
   "$work/example" >"$work/printed" 2>/dev/null || { echo "$example fails"; exit 1; }
