@@ -7,6 +7,7 @@
 #include <cmath>
 #include <cstddef>
 #include <cstdint>
+#include <limits>
 #include <type_traits>
 
 #include "M_Matrix.h"
@@ -98,10 +99,12 @@ class Operands {
   }
 
   double AnyDouble() {
-    static constexpr double kEdges[] = {
-        0.0,    -0.0,   0.5,      -0.5,      1e-12,   -1e-12,       1e-6,
-        1e-5,   0.1,    1e-300,   1e300,     32767.0, 2147483647.0, -2147483648.0,
-        9.3e18, 4e-324, INFINITY, -INFINITY, NAN};
+    constexpr double kInfinity = std::numeric_limits<double>::infinity();
+    constexpr double kNan = std::numeric_limits<double>::quiet_NaN();
+    static constexpr double kEdges[] = {0.0,    -0.0,      0.5,          -0.5,          1e-12,
+                                        -1e-12, 1e-6,      1e-5,         0.1,           1e-300,
+                                        1e300,  32767.0,   2147483647.0, -2147483648.0, 9.3e18,
+                                        4e-324, kInfinity, -kInfinity,   kNan};
     const uint32_t kind = Below(8);
     if (kind < 2) return UsualDouble();
     const double edge = kEdges[Below(sizeof kEdges / sizeof kEdges[0])];

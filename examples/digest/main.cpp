@@ -2,6 +2,7 @@
 // that others do.
 
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <map>
@@ -13,7 +14,6 @@
 
 namespace {
 
-using digest::AreaEntry;
 using digest::DigestOf;
 using digest::kAreaCount;
 using digest::kAreas;
@@ -46,6 +46,7 @@ std::map<std::string, std::string> Read(const char* path) {
 bool AreThreadsAlike(int count, const uint64_t* expected) {
   std::vector<int> differences(static_cast<size_t>(count), 0);
   std::vector<std::thread> threads;
+  threads.reserve(differences.size());
   for (int& number : differences) {
     threads.emplace_back([&number, expected] {
       for (size_t i = 0; i < kAreaCount; ++i) {
@@ -90,7 +91,7 @@ int main(int argc, char** argv) {
   for (int i = 1; i < argc; ++i) {
     const bool hasValue = i + 1 < argc;
     if (hasValue && std::strcmp(argv[i], "--threads") == 0) {
-      threads = std::atoi(argv[++i]);
+      threads = static_cast<int>(std::strtol(argv[++i], nullptr, 10));
     } else if (hasValue && std::strcmp(argv[i], "--compare") == 0) {
       file = argv[++i];
     } else {

@@ -39,7 +39,7 @@ void CallOnUsual(Area& area, int32_t (*function)(const Matrix*, Matrix*)) {
   for (int i = 0; i < Area::kTimes; ++i) {
     Operands& operands = area.operands();
     Matrix m = {}, out = {};
-    constexpr int kSize = sizeof m.m / sizeof m.m[0];
+    constexpr int kSize = sizeof(m.m) == sizeof(M_Matrix3) ? 3 : 4;
     for (int row = 0; row < kSize; ++row) {
       m.m[row][row] = 1;
       for (int k = 0; k < 2; ++k) {
