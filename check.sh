@@ -40,8 +40,11 @@ for preset in $presets; do
   ctest --preset "$preset" --progress
   if [ "$preset" = clang ]; then
     echo "Reading with clang-tidy ..."
-    find src host examples/comp examples/digest -name '*.cpp' | xargs -n 1 -P 2 \
+    find src host -name '*.cpp' | xargs -n 1 -P 2 \
       clang-tidy --quiet --warnings-as-errors='*' -p "build/$preset" 2>/dev/null
+    # Following every path through a reader of JSON takes longer than all else.
+    find examples/comp examples/digest -name '*.cpp' | xargs -n 1 -P 2 \
+      clang-tidy --quiet --warnings-as-errors='*' --checks='-clang-analyzer-*' -p "build/$preset" 2>/dev/null
   fi
 done
 
