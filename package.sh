@@ -16,6 +16,7 @@ lintian --fail-on error build/packages/*.deb
 [ "${1-}" = --try ] || exit 0
 need_packages gdb
 work=$(mktemp -d)
+export CMAKE_GENERATOR=Ninja
 remove() {
   dpkg --purge libm-math-dev libm-math1 >/dev/null 2>&1
   rm -rf "$work"

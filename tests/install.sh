@@ -23,6 +23,7 @@ got: $2"
 
 cmake --install "$build" --prefix "$work/first" >/dev/null
 mv "$work/first" "$work/moved"
+export CMAKE_GENERATOR=Ninja
 export PKG_CONFIG_PATH="$work/moved/$libdir/pkgconfig" LD_LIBRARY_PATH="$work/moved/$libdir"
 if [ -e "$work/moved/$libdir/libM.so" ]; then
   (cd "$work/moved" && find . -type f -o -type l) | sed "s:^\./$libdir:lib:; s:^\./::; s:MTargets-[a-z]*:MTargets-CONFIG:" | sort >"$work/files"
