@@ -21,6 +21,11 @@
 /// Conventions: a function that can fail returns a 32-bit code, 0 for success. Pointers must not be
 /// null unless their comment says so; flags that only inform (`unsigned char*`) may always be null.
 /// Everything but the life cycle and the fast tables may be called from any thread.
+///
+/// In all headers, the same arguments give the same bits with every compiler, optimisation,
+/// processor and number of threads. Excepted are the sine table and what M_Rect.h and M_Matrix.h
+/// compute by the platform's sin, cos, asin, acos and atan2 (rotations, decompositions, slerp,
+/// bearings), and the sign and payload of a NaN.
 #ifndef M_UTILS_H
 #define M_UTILS_H
 

@@ -47,7 +47,7 @@ constexpr double kStep = 0x1p-29;
 class Axis {
  public:
   Axis(double least, double greatest) : least_(least), step_((greatest - least) * kStep) {
-    // No extent, or none that a double holds.
+    // No extent, one too small to be divided, or a NaN.
     if (!(step_ > 0)) step_ = 1;
   }
 
