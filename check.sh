@@ -18,8 +18,14 @@ case ${1-} in
     exit
     ;;
   --fuzz)
+    case ${2-} in
+      '' | 0* | *[!0-9]*)
+        echo 'check.sh --fuzz takes a number of seconds'
+        exit 2
+        ;;
+    esac
     . scripts/fuzz.sh
-    fuzz "${2-10}"
+    fuzz "$2"
     exit
     ;;
   *)

@@ -27,13 +27,15 @@ dpkg -L libm-math1 libm-math-dev | sort -u >"$work/files"
 echo "A client by CMake:"
 cmake -S examples/digest -B "$work/digest" >/dev/null
 cmake --build "$work/digest" >/dev/null
-"$work/digest/digest" --compare examples/digest/expected.txt >/dev/null && echo "the recorded digests"
+"$work/digest/digest" --compare examples/digest/expected.txt >/dev/null
+echo "the recorded digests"
 echo "A client by pkg-config:"
 # shellcheck disable=SC2046
-g++ -g -std=c++17 examples/reference/ratios.cpp $(pkg-config --cflags --libs M) -o "$work/ratios"
+g++ -g -std=c++17 examples/reference/ratios.cpp $(pkg-config --cflags --libs M) -o "$work/ratios" | tee "$work/printed"
+sed -nE 's/^.*;  +\/\/ -> (.*)$/\1/p' examples/reference/ratios.cpp | diff - "$work/printed"
 "$work/ratios"
 echo "In gdb, which loads the printers by itself:"
-gdb -nx -batch -ex 'break M_AddRatio' -ex run -ex up -ex 'print frame' "$work/ratios" 2>/dev/null | grep '^\$1'
+gdb -nx -batch -ex 'break M_AddRatio' -ex run -ex up -ex 'print frame' "$work/ratios" 2>/dev/null | grep -F '$1 = 1001/30000 = '
 dpkg --purge libm-math-dev libm-math1 >/dev/null
 # What is left are folders that others have files in.
 while read -r file; do [ ! -f "$file" ] || { echo "$file is left"; exit 1; }; done <"$work/files"

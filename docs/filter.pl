@@ -15,6 +15,12 @@ sub slug {
   return $slug;
 }
 
+# Doxygen does not miss the comment of an enumerator.
+my $text = join '', @lines;
+while ($text =~ /\benum\b[^{;]*\{\n(.*?)\n\};/sg) {
+  $_ =~ /\/\/\/</ || $_ =~ /^\s*\/\// || die "$path: not documented: $_\n" for split /\n/, $1;
+}
+
 for (my $i = 0; $i < @lines; ++$i) {
   local $_ = $lines[$i];
   if (/^\/\/ -----/) {

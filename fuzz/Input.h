@@ -9,6 +9,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <string>
 #include <vector>
 
 #include "M_Matrix.h"
@@ -61,6 +62,8 @@ class Input {
     }
     return record;
   }
+
+  std::string Text() { return bytes_.ConsumeRemainingBytesAsString(); }
 
   std::vector<Vector2> Points(size_t most) {
     std::vector<Vector2> points;

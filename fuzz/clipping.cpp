@@ -43,6 +43,10 @@ void Run(Input& input) {
   if (subject.size() >= 3) Require(IsSame(Clip(around, subject), subject));
   const double area = M_SignedPolygonArea2D(corners.data(), static_cast<int32_t>(corners.size()));
   if (!isConvex || corners.size() < 3 || !(std::abs(area) > 1)) return;
+  std::vector<Vector2> rest;
+  for (const Vector4& p : result) rest.push_back({p.x, p.y});
+  const double left = M_SignedPolygonArea2D(rest.data(), static_cast<int32_t>(rest.size()));
+  Require(std::abs(left) <= std::abs(area) * 1.01 + 1 || subject.size() > 4);
   std::reverse(clipper.begin(), clipper.end());
   Require(IsSame(Clip(clipper, subject), result));
 }

@@ -9,9 +9,7 @@
 #include "SheetText.h"
 
 void Run(Input& input) {
-  std::string text;
-  while (!input.IsEmpty()) text.push_back(static_cast<char>(input.Any<char>()));
-  std::istringstream stream(text);
+  std::istringstream stream(input.Text());
   try {
     const comp::Composition composition = comp::ReadComposition(stream, "input");
     const comp::Sheet sheet = comp::MakeSheet(composition);

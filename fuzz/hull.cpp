@@ -23,7 +23,9 @@ void Run(Input& input) {
   const auto [top, bottom] =
       std::minmax_element(points.begin(), points.end(), [](auto& a, auto& b) { return a.y < b.y; });
   const double size = std::max(right->x - left->x, bottom->y - top->y);
-  const bool isLine = Turn(hull[0], hull[1], hull[2]) == 0;
+  const Vector2 first = *left, last = *right;
+  const bool isLine = std::all_of(points.begin(), points.end(),
+                                  [&](const Vector2& p) { return Turn(first, last, p) == 0; });
   for (size_t i = 0; i < hull.size() && !isLine; ++i) {
     const Vector2 &a = hull[i], &b = hull[(i + 1) % hull.size()];
     Require(Turn(a, b, hull[(i + 2) % hull.size()]) > -size * size * 1e-8);

@@ -24,10 +24,4 @@ void Run(Input& input) {
   } catch (int) {
     // A point at the height of the eye.
   }
-  const auto m3 = input.Any<M_Matrix3>();
-  auto point = input.Any<Vector3>();
-  try {
-    M_TransformPoint3DtoScreen(toEye, toScreen, m3, &point);
-  } catch (int) {
-  }
 }

@@ -50,6 +50,21 @@ void Run(Input& input) {
   check(M_MulRatio, an * bn, ad * bd);
   if (b.num > 0 && b.den < 0x80000000) check(M_DivRatio, an * bd, ad * bn);
 
+  // Where everything fits, everything is exact.
+  const M_Ratio c = {a.num % 32768, a.den % 32767 + 1}, d = {b.num % 32768, b.den % 32767 + 1};
+  const Wide cn = c.num, cd = c.den, dn = d.num, dd = d.den;
+  const auto isExactly = [&](auto* function, Wide num, Wide den) {
+    unsigned char status = 0;
+    return function(&c, &d, &r, &status) == 0 && status == 0 && IsValue(r, num, den);
+  };
+  Require(isExactly(M_AddRatio, cn * dd + dn * cd, cd * dd));
+  Require(isExactly(M_SubRatio, cn * dd - dn * cd, cd * dd));
+  Require(isExactly(M_MulRatio, cn * dn, cd * dd));
+  if (d.num > 0) Require(isExactly(M_DivRatio, cn * dd, cd * dn));
+  unsigned char isConverted = 2, isTooLarge = 2;
+  Require(M_ConvRatio(&c, d.den, &r, &isConverted, &isTooLarge) == 0 && !isTooLarge);
+  Require(isConverted == (cn * dd % cd == 0));
+
   unsigned char isReduced;
   if (a.den != 0) {
     Require(M_ReduceRatio(&a, &r, &isReduced) == 0 && IsValue(r, an, ad));

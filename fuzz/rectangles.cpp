@@ -33,7 +33,7 @@ void Run(Input& input) {
   Require(inner.left >= outer.left && inner.right <= outer.right);
   Require(nearest.left >= outer.left && nearest.bottom <= outer.bottom);
   auto longs = input.Any<M_LRect>();
-  M_Rect shorts;
+  M_Rect shorts = {};
   if (M_LRect2Rect(&longs, &shorts) == 0) {
     // Only one side of each edge is looked at.
     Require(shorts.left == static_cast<int16_t>(longs.left) && longs.left >= INT16_MIN);

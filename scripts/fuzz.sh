@@ -9,9 +9,12 @@ fuzz() {
   for source in fuzz/*.cpp; do basename "$source" .cpp; done | xargs -P 2 -I NAME sh -c '
     mkdir -p build/fuzz/corpus/NAME
     seeds=fuzz/corpus/NAME
-    [ -d "$seeds" ] || seeds=examples/comp/samples
+    if [ NAME = composition ]; then
+      seeds=
+      cp examples/comp/samples/*.json build/fuzz/corpus/NAME
+    fi
     if build/fuzz/bin/fuzz_NAME -max_total_time="$seconds" -timeout=20 -max_len=4096 -print_final_stats=1 \
-      -artifact_prefix=build/fuzz/found/NAME- build/fuzz/corpus/NAME "$seeds" >build/fuzz/NAME.log 2>&1; then
+      -artifact_prefix=build/fuzz/found/NAME- build/fuzz/corpus/NAME $seeds >build/fuzz/NAME.log 2>&1; then
       echo "NAME: $(sed -n "s/^stat::number_of_executed_units: *//p" build/fuzz/NAME.log) inputs, nothing found"
     else
       tail -n 25 build/fuzz/NAME.log

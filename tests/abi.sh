@@ -12,7 +12,8 @@ trap 'rm -rf "$work"' EXIT
 # The names of the private node are still listed, so they are taken out.
 abidw --suppressions "$2/src/pkg/M/linux/M.abignore" --exported-interfaces-only --headers-dir "$2/include" \
   --headers-dir "$2/host/include" --drop-private-types --no-show-locs --no-corpus-path --no-comp-dir-path \
-  --type-id-style hash "$library" | sed "/version='M_PRIVATE'/d; s,path='$2/,path='," >"$work/M.abi"
+  --type-id-style hash --out-file "$work/all.abi" "$library"
+sed "/version='M_PRIVATE'/d; s,path='$2/,path='," "$work/all.abi" >"$work/M.abi"
 if [ "${3-}" = --record ]; then
   cp "$work/M.abi" "$recorded"
 else

@@ -9,7 +9,8 @@ cat >"$work/program.cpp" <<'END'
 #include "M_Matrix.h"
 int main() {
   const M_Ratio ratio = {1001, 30000}, broken = {1, 0};
-  const M_Fixed fixed = -0x18000;
+  const M_Fixed fixed = -0x18000, large = 0x30392B85;
+  const M_WHRect pair = {{1, 2, 3, 4}};
   const M_Fix24 fraction = 0x800000;
   const M_Point point = {2, 1};
   const M_FixedPoint fixedPoint = {0x8000, 0x10000};
@@ -33,7 +34,9 @@ fixed = -1.5
 fixedPoint = (0.5, 1)
 floatRect = (0.5, 0) to (1e+300, 3)
 fraction = 0.5
+large = 12345.169998168945
 matrix = [1, 0, 0; 0, 1, 0; 5, 6.5, 1]
+pair = (1, 2, 3, 4)
 point = (1, 2)
 points = {(1, 2), (3, 4)}
 ratio = 1001/30000 = 0.0333666667

@@ -162,20 +162,6 @@ TEST_F(Space, IntegerPointsAreRoundedAndBoundedOneByOne) {
   TestIntegers<M_FixedPoint>(M_TransformFixPoints, 65536, -2147483648.0, 2147483647, generator_);
 }
 
-// More points than the inner batches of the function hold.
-TEST_F(Space, ShortPointsInSpaceMatchThoseInThePlane) {
-  const M_Matrix4 m = {{{0, 2, 0, 0}, {-2, 0, 0, 0}, {9, 9, 9, 9}, {5, -6, 7, 1}}};
-  std::vector<M_Point> points(200);
-  for (M_Point& p : points) p = {static_cast<int16_t>(Digit()), static_cast<int16_t>(Digit())};
-  const std::vector<M_Point> given = points;
-  ASSERT_EQ(M_3DTransform2DPoints(&m, 0, nullptr), 0);
-  ASSERT_EQ(M_3DTransform2DPoints(&m, 199, points.data()), 0);
-  for (size_t i = 0; i < 200; ++i) {
-    EXPECT_EQ(points[i].h, i < 199 ? -2 * given[i].v + 5 : given[i].h) << i;
-    EXPECT_EQ(points[i].v, i < 199 ? 2 * given[i].h - 6 : given[i].v) << i;
-  }
-}
-
 TEST_F(Space, RectanglesAreTheCellsTheyCover) {
   for (int round = 0; round < 3000; ++round) {
     const auto edge = [&] { return static_cast<int16_t>(generator_.Below(6)); };
@@ -275,20 +261,6 @@ TEST_F(Space, InversesUndo) {
     M_CalcNormalMatrix4(&m4, &product4);
     M_TransposeMatrix4(&product4, &product4);
     ASSERT_EQ(std::memcmp(&product4, &inverse4, sizeof inverse4), 0);
-  }
-}
-
-TEST_F(Space, RotationsAreThoseOfThePlatform) {
-  for (int round = 0; round < 2000; ++round) {
-    const double degrees = round == 0 ? 360 : Uniform() * 100, cx = Uniform(), cy = Uniform();
-    const double angle = degrees * 0.017453292519943295, c = std::cos(angle), s = std::sin(angle);
-    const M_Matrix3 rotation = {
-        {{c, s, 0}, {-s, c, 0}, {(1 - c) * cx + s * cy, (1 - c) * cy - s * cx, 1}}};
-    const auto m = Random<M_Matrix3>(&Space::Uniform);
-    M_Matrix3 rotated = m, expected = m;
-    ASSERT_EQ(M_RotateMatrix(&rotated, degrees, cx, cy), 0);
-    M_ConcatMatrix(&rotation, &expected);
-    ASSERT_EQ(std::memcmp(&rotated, &expected, sizeof expected), 0);
   }
 }
 

@@ -51,7 +51,7 @@ class Area {
     });
   }
 
-  /// A report of the library in this thread, and after the call the last error it leaves.
+  /// A report of the library in this thread.
   void AddReport(uint32_t id, int32_t severity, const char* text);
 
   /// Calls a function many times as its signature says. Outputs are drawn like inputs, so that what
@@ -62,7 +62,7 @@ class Area {
     CallAs<Result, Parameters...>(function, nullable, std::index_sequence_for<Parameters...>());
   }
 
-  /// Calls work() and counts what it throws, if it does.
+  /// Calls work() and counts what it throws, if it does, and after a report the last error.
   template <class Work>
   void Try(const Work& work) {
     try {
@@ -70,6 +70,7 @@ class Area {
     } catch (int code) {
       Add(code);
     }
+    if (std::exchange(hasReported_, false)) AddLastError();
   }
 
   static constexpr int kTimes = 2000;
@@ -93,7 +94,6 @@ class Area {
         }
       });
       (AddAll(std::get<kIndex>(slots).values), ...);
-      if (std::exchange(hasReported_, false)) AddLastError();
     }
   }
 

@@ -100,13 +100,21 @@ void HitTests(Area& area) {
 void Clipping(Area& area) {
   Operands& operands = area.operands();
   for (int i = 0; i < Area::kTimes; ++i) {
-    std::vector<Vector4> clipper(operands.Below(7)), subject(operands.Below(9)), result;
-    for (auto* polygon : {&clipper, &subject}) {
-      const uint32_t shape = operands.Below(kShapes);
-      for (Vector4& p : *polygon) {
-        const Vector2 at = InShape(operands, shape);
-        p = {at.x, at.y, operands.Make<double>(), operands.Make<double>()};
-      }
+    std::vector<Vector4> clipper, subject, result;
+    // Half of them convex clippers that cut what is in the unit circle, the others anything.
+    const bool isUsual = i % 2 == 0;
+    const uint32_t shape = isUsual ? operands.Below(2) : operands.Below(kShapes);
+    std::vector<Vector2> corners(operands.Below(9));
+    for (Vector2& p : corners) p = InShape(operands, shape);
+    if (isUsual) {
+      const std::vector<Vector2> all = corners;
+      M_ComputeConvexHull(all.cbegin(), all.cend(), corners);
+    }
+    for (const Vector2& p : corners) clipper.push_back({p.x, p.y, 0, 1});
+    for (uint32_t k = operands.Below(9); k > 0; --k) {
+      const Vector2 at = InShape(operands, shape);
+      const double z = operands.Make<double>();
+      subject.push_back({at.x, at.y, z, operands.Make<double>()});
     }
     M_PolyPolyClip2D(&clipper, &subject, &result);
     area.Add(static_cast<uint32_t>(result.size()));
@@ -180,7 +188,8 @@ void Quads(Area& area) {
 void RunLines(Area& area) {
   area.Call(
       +[](const Vector3* points, uint32_t count, M_PlaneEq* plane, Vector3* centroid) {
-        return M_GetPlaneEquation(points, static_cast<int32_t>(count % 5), plane, centroid);
+        return M_GetPlaneEquation(points, static_cast<int32_t>(count % 9 == 0 ? 0 : count % 4 + 1),
+                                  plane, centroid);
       },
       0b1000);
   area.Call(M_GetPlaneEquation2);

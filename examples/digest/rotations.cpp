@@ -21,11 +21,16 @@ void Decompose(Area& area,
     m.m[3][3] = 1;
     M_Matrix4Decomp parts = {};
     unsigned char hasFailed = 0;
-    area.Add(function(&m, &parts, operands.Below(2) ? &hasFailed : nullptr));
+    area.Try([&] { area.Add(function(&m, &parts, operands.Below(2) ? &hasFailed : nullptr)); });
     area.Add(parts);
     area.Add(hasFailed);
     area.Add(M_Correct3DDecompFor2D(&parts));
     area.Add(parts);
+    double angles[3] = {};
+    area.Try([&] {
+      area.Add(M_GetOrderedXYZRotationFromMatrix(&m, &angles[0], &angles[1], &angles[2]));
+    });
+    area.Add(angles);
   }
 }
 

@@ -3,9 +3,11 @@
 #include "M_Utils.h"
 
 int main() {
-  // After how many samples at 48000 a second a frame at 25 a second begins with a sample again.
-  uint32_t gcd, lcm;
-  M_UnsignedGCD(48000, 25, &gcd);
-  M_UnsignedLCM(1920, 1001, &lcm);
-  std::printf("%u %u\n", gcd, lcm);  // -> 25 1921920
+  // At 48000 samples a second a frame at 25 a second has 1920. A frame and a block of 1024 samples
+  // begin together every
+  uint32_t samples, common;
+  M_UnsignedLCM(1920, 1024, &samples);
+  std::printf("%u\n", samples);  // -> 15360
+  M_UnsignedGCD(1920, 1024, &common);
+  std::printf("%u\n", common);  // -> 128
 }

@@ -11,7 +11,7 @@ def text(value):
     kind = value.type
     bits = FIXED_TYPES.get(kind.name)
     if bits:
-        return "%g" % (int(value) / (1 << bits))
+        return repr(int(value) / (1 << bits)).removesuffix(".0")
     if kind.strip_typedefs().code == gdb.TYPE_CODE_FLT:
         return repr(float(value)).removesuffix(".0")
     return str(int(value))
@@ -32,6 +32,10 @@ def point(p):
 
 def rectangle(r):
     return "%s to %s" % (fields(r, ("left", "top")), fields(r, ("right", "bottom")))
+
+
+def values(r):
+    return "(%s)" % ", ".join(text(r["values"][i]) for i in range(4))
 
 
 def vector(v):
@@ -64,6 +68,7 @@ RECORDS = {
     "M_LRect": rectangle,
     "M_FixedRect": rectangle,
     "M_FloatRect": rectangle,
+    "M_WHRect": values,
     "M_Matrix3": matrix,
     "M_Matrix4": matrix,
     "M_PlaneEq": vector,
