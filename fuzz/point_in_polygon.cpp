@@ -42,11 +42,6 @@ void Run(Input& input) {
   std::rotate(poly.begin(), poly.begin() + static_cast<std::ptrdiff_t>(poly.size() / 3),
               poly.end());
   Require(isInside(poly) == inside);
-  if (poly.size() == 4 && tolerance == 0) {
-    unsigned char inQuad;
-    M_IsFloatPointInQuad(&p, poly.data(), &inQuad);
-    Require(inQuad == inside);
-  }
   std::vector<Vector2> twice;
   for (const Vector2& q : poly) twice.insert(twice.end(), 2, q);
   Require(isInside(twice) == inside);

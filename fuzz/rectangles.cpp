@@ -32,15 +32,13 @@ void Run(Input& input) {
   M_FixedRect2LRect(&fixed, &nearest);
   Require(inner.left >= outer.left && inner.right <= outer.right);
   Require(nearest.left >= outer.left && nearest.bottom <= outer.bottom);
-  auto longs = input.Any<M_LRect>();
+  const auto longs = input.Any<M_LRect>();
   M_Rect shorts = {};
   if (M_LRect2Rect(&longs, &shorts) == 0) {
     // Only one side of each edge is looked at.
     Require(shorts.left == static_cast<int16_t>(longs.left) && longs.left >= INT16_MIN);
     Require(shorts.bottom == static_cast<int16_t>(longs.bottom) && longs.bottom <= INT16_MAX);
   }
-  M_CenterLRect(&outer, &longs);
-  M_InsetLRect(&longs, input.Any<int32_t>(), input.Any<int32_t>());
   const auto m = input.Any<M_Matrix3>();
   auto floats = input.Any<M_FloatRect>();
   Vector2 corners[4];

@@ -215,12 +215,12 @@ int32_t M_ConcatMatrix(const M_Matrix3* a, M_Matrix3* b);
 
 /// What M_GetMatrixType tells, by exact comparison.
 enum : uint32_t {
-  M_MATRIX_IDENTITY = 0,
-  M_MATRIX_TRANSLATE = 1,
-  M_MATRIX_SCALE = 2,
-  M_MATRIX_SCALE_TRANSLATE = 3,
-  M_MATRIX_AFFINE = 4,       ///< m[0][1] or m[1][0] is not 0: rotation or skew.
-  M_MATRIX_PERSPECTIVE = 5,  ///< The last column is not (0, 0, 1).
+  M_MATRIX_IDENTITY = 0,         ///< Moves nothing.
+  M_MATRIX_TRANSLATE = 1,        ///< Only the last row moves points.
+  M_MATRIX_SCALE = 2,            ///< Only the diagonal does.
+  M_MATRIX_SCALE_TRANSLATE = 3,  ///< Both do.
+  M_MATRIX_AFFINE = 4,           ///< m[0][1] or m[1][0] is not 0: rotation or skew.
+  M_MATRIX_PERSPECTIVE = 5,      ///< The last column is not (0, 0, 1).
 };
 
 /// *type = the first kind that fits, the most general first. Always 0.
