@@ -43,6 +43,7 @@
 #include "M_Rect.h"
 #include "M_Utils.h"
 #include "U.h"
+#include "qelcore/geom/PointT.h"
 
 #pragma GCC visibility push(default)
 
@@ -86,9 +87,6 @@ struct M_Vector4T {
 };
 static_assert(sizeof(M_Vector4T<double>) == 32 && offsetof(M_Vector4T<double>, y) == 8);
 static_assert(offsetof(M_Vector4T<double>, z) == 16 && offsetof(M_Vector4T<double>, w) == 24);
-
-template <>
-void M_Vector4T<double>::Normalize();
 
 // ---------------------------------------------------------------------------------------------
 // Matrices
@@ -515,6 +513,9 @@ bool M_TransformPoint2DtoScreen(const M_Matrix3& first, const M_Matrix3& second,
 template <class Point>
 int32_t M_IsFloatPointInConcavePoly(const Point* point, const Point* poly, int32_t count,
                                     double tolerance, unsigned char* inside);
+template <class Point, class Poly>
+int32_t M_IsFloatPointInConcavePoly(Point point, Poly poly, int32_t count, double tolerance,
+                                    unsigned char* inside);
 
 // ---------------------------------------------------------------------------------------------
 // Quads on the screen. What they call throws its error code as an `int`.
@@ -615,6 +616,8 @@ static_assert(sizeof(M_LongPoint) == 8 && offsetof(M_LongPoint, y) == 4);
 /// not noticed: a pentagram is convex.
 template <class Iterator>
 bool M_IsConvex(Iterator first, Iterator last);
+template <class First, class Last>
+bool M_IsConvex(First first, Last last);
 
 /// out = the corners of the hull, from the lowest (then leftmost) counter-clockwise with y upwards.
 /// The points are first moved to the nearest of 2^29 steps along each axis of their bounding box,
@@ -625,6 +628,8 @@ bool M_IsConvex(Iterator first, Iterator last);
 template <class Iterator>
 void M_ComputeConvexHull(Iterator first, Iterator last,
                          std::vector<typename std::iterator_traits<Iterator>::value_type>& out);
+template <class First, class Last, class Out>
+void M_ComputeConvexHull(First first, Last last, Out& out);
 
 #pragma GCC visibility pop
 

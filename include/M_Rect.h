@@ -205,9 +205,17 @@ int32_t M_CenterRect(const M_Rect* container, M_Rect* r);
 int32_t M_CenterLRect(const M_LRect* container, M_LRect* r);
 int32_t M_CenterFixedRect(const M_FixedRect* container, M_FixedRect* r);
 
+// No C program could call these two, and none is meant to.
+#ifdef __clang__
+#pragma clang diagnostic push
+#pragma clang diagnostic ignored "-Wreturn-type-c-linkage"
+#endif
 /// The halves of r, in place: writing to the point writes to r.
 M_Point& M_TopLeft(M_Rect& r);
 M_Point& M_BottomRight(M_Rect& r);
+#ifdef __clang__
+#pragma clang diagnostic pop
+#endif
 
 // ---------------------------------------------------------------------------------------------
 // Points and rectangles

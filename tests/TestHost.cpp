@@ -29,8 +29,11 @@ void Note(const char* format, Args... args) {
 U_Handle Allocate(size_t bytes) {
   ++host.allocations;
   if (std::count(host.failing.begin(), host.failing.end(), host.allocations)) return nullptr;
+  if (std::count(host.reclaiming.begin(), host.reclaiming.end(), host.allocations)) {
+    std::free(std::exchange(*host.lastHandle, nullptr));
+  }
   ++host.handles;
-  return new void*(std::memset(std::malloc(bytes), 0xEE, bytes));
+  return host.lastHandle = new void*(std::memset(std::malloc(bytes), 0xEE, bytes));
 }
 
 }  // namespace

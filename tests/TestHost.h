@@ -11,11 +11,15 @@
 #include <utility>
 #include <vector>
 
+#include "U.h"
+
 struct TestHost {
   std::vector<std::string> calls;  ///< Reports, log lines and calls about memory, in order.
   int touches = 0;                 ///< Calls of any kind.
   int allocations = 0;             ///< Attempts to allocate a handle.
   std::vector<int> failing;        ///< Attempts that fail, counted from 1.
+  std::vector<int> reclaiming;     ///< Attempts at which the block given before is reclaimed.
+  U_Handle lastHandle = nullptr;   ///< What was given before.
   int handles = 0;                 ///< Handles not freed.
   int trackedBlocks = 0;           ///< Tracked blocks not freed.
   size_t trackedBytes = 0;         ///< Of the last one.

@@ -267,4 +267,21 @@ TEST_F(Polygons, ClippedPartsAddUp) {
   }
 }
 
+// Also where both neighbours are on one side of the line, one of them too close to it to be inside.
+TEST_F(Polygons, NewPointsCarryWhatLiesBetween) {
+  std::vector<V4> result;
+  const std::vector<V4> clipper = {{0, 0, 0, 0}, {1, 0, 0, 0}, {1, 1, 0, 0}, {0, 1, 0, 0}};
+  for (int round = 0; round < 300; ++round) {
+    std::vector<V4> subject;
+    for (int i = 0; i < 5; ++i) {
+      const double side =
+          generator_.OneOf({0.0, 1.0}) + Uniform(2) * generator_.OneOf({1e-6, 1e-9});
+      subject.push_back({Uniform(2), Uniform(2), Uniform(1), 0.5});
+      (generator_.Below(2) ? subject.back().x : subject.back().y) = side;
+    }
+    M_PolyPolyClip2D(&clipper, &subject, &result);
+    for (const V4& p : result) ASSERT_TRUE(std::abs(p.z) <= 1 && p.w == 0.5) << round;
+  }
+}
+
 }  // namespace

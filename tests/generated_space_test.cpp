@@ -157,6 +157,20 @@ void TestIntegers(int32_t (*transform)(const M_Matrix3*, int32_t, Point*), doubl
   }
 }
 
+TEST_F(Space, BatchesOfNothingReadNothing) {
+  for (const int32_t count : {0, -1, INT32_MIN}) {
+    EXPECT_EQ(M_TransformFloatPoints(nullptr, count, nullptr) |
+                  M_TransformPoints(nullptr, count, nullptr) |
+                  M_TransformFixPoints(nullptr, count, nullptr) |
+                  M_TransformVector3(nullptr, count, nullptr) |
+                  M_TransformVector4NoDivide(nullptr, count, nullptr) |
+                  M_TransformVector4(nullptr, count, nullptr) |
+                  M_Transform3DFloatPoints(nullptr, count, nullptr) |
+                  M_3DTransform2DPoints(nullptr, count, nullptr),
+              0);
+  }
+}
+
 TEST_F(Space, IntegerPointsAreRoundedAndBoundedOneByOne) {
   TestIntegers<M_Point>(M_TransformPoints, 1, -32768, 32767, generator_);
   TestIntegers<M_FixedPoint>(M_TransformFixPoints, 65536, -2147483648.0, 2147483647, generator_);

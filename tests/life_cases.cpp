@@ -166,6 +166,22 @@ TEST(MessageTable, Layout) {
   EXPECT_EQ(hash, 0xE670E85681B32FDE) << "a text has changed, and with it the catalogues' keys";
 }
 
+// A host that takes the first block back to give the second.
+TEST(CharTables, AreFilledAsFarAsTheyAreThere) {
+  host.reclaiming = {2, 4};
+  EXPECT_EQ(M_Birth(M_SERVICE_FCMD, nullptr), 0);
+  unsigned char ready = 9;
+  const unsigned char *mul = nullptr, *div = nullptr;
+  EXPECT_EQ(M_PrepareFCMD(true, false, &ready, &mul, &div), M_ERR_MEMORY);
+  EXPECT_EQ(M_UnprepareFCMD(), 0);
+  EXPECT_TRUE(ready == 0 && !mul && !div && !*Mp_G.fcmTable && *Mp_G.fcdTable);
+  EXPECT_EQ(M_PrepareFCMD(true, false, &ready, &mul, &div), 0);
+  EXPECT_TRUE(ready == 1 && mul[65535] == 255 && div[65535] == 255);
+  EXPECT_EQ(M_UnprepareFCMD() | M_Death() | host.handles, 0);
+  Mp_G = {};
+  host = {};
+}
+
 // Every entry of the character tables is the nearest of its quotient.
 TEST(CharTables, AreRoundedToNearest) {
   EXPECT_EQ(Mp_SetupFCM(), 0);

@@ -140,7 +140,8 @@ struct U_Report {
 typedef void (*U_ReportCallback)(void* context, const U_Report* report);
 void U_SetReportCallback(U_ReportCallback callback, void* context);
 
-/// Receives every log line, in the same way.
+/// Receives every log line, in the same way; but a null callback stands for a line on standard
+/// error only where the environment has a variable U_LOG when the first line comes.
 typedef void (*U_LogCallback)(void* context, int32_t level, const char* component,
                               const char* event, const char* text);
 void U_SetLogCallback(U_LogCallback callback, void* context);

@@ -1,6 +1,7 @@
 // Reports and log lines: the thread's buffer and last error, and the callbacks that receive them.
 
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <mutex>
 #include <new>
@@ -30,7 +31,9 @@ void PrintReport(void*, const U_Report* report) {
 
 void PrintLogLine(void*, int32_t level, const char* component, const char* event,
                   const char* text) {
-  std::fprintf(stderr, "%s %s (%d): %s\n", component, event, static_cast<int>(level), text);
+  static const bool isWanted = std::getenv("U_LOG") != nullptr;
+  if (isWanted)
+    std::fprintf(stderr, "%s %s (%d): %s\n", component, event, static_cast<int>(level), text);
 }
 
 // A callback and what it is called with, replaced and read as one.

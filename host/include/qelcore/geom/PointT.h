@@ -3,6 +3,8 @@
 #ifndef QELCORE_GEOM_POINTT_H
 #define QELCORE_GEOM_POINTT_H
 
+#pragma GCC visibility push(default)
+
 namespace qelcore::geom {
 
 /// A pair of coordinates.
@@ -13,5 +15,7 @@ struct PointT {
 };
 
 }  // namespace qelcore::geom
+
+#pragma GCC visibility pop
 
 #endif  // QELCORE_GEOM_POINTT_H

@@ -467,13 +467,8 @@ std::vector<T> ComputeHull(const T* points, size_t count) {
   return result;
 }
 
-}  // namespace
-
-// A template is exported where it is defined.
-#pragma GCC visibility push(default)
-
 template <class Iterator>
-bool M_IsConvex(Iterator first, Iterator last) {
+bool IsConvex(Iterator first, Iterator last) {
   constexpr double kEpsilon = std::numeric_limits<double>::epsilon();
   constexpr double kStraight = kEpsilon * kEpsilon + 2 * kEpsilon;
   const auto count = last - first;
@@ -497,10 +492,8 @@ bool M_IsConvex(Iterator first, Iterator last) {
   return true;
 }
 
-template <class Iterator>
-void M_ComputeConvexHull(Iterator first, Iterator last,
-                         std::vector<typename std::iterator_traits<Iterator>::value_type>& out) {
-  using T = typename std::iterator_traits<Iterator>::value_type;
+template <class Iterator, class T>
+void FindHull(Iterator first, Iterator last, std::vector<T>& out) {
   const auto count = static_cast<size_t>(last - first);
   // The result may replace the points themselves.
   std::vector<T> result = count <= 3 ? std::vector<T>(first, last) : ComputeHull<T>(&*first, count);
@@ -514,23 +507,71 @@ using Vector3 = M_Vector3T<double>;
 using Vector4 = M_Vector4T<double>;
 using PointF = qelcore::geom::PointT<float>;
 
-template bool M_IsConvex(VectorIterator<Vector2>, VectorIterator<Vector2>);
-template bool M_IsConvex(VectorIterator<Vector3>, VectorIterator<Vector3>);
-template bool M_IsConvex(VectorIterator<Vector4>, VectorIterator<Vector4>);
-template bool M_IsConvex(const Vector2*, const Vector2*);
-template bool M_IsConvex(const Vector3*, const Vector3*);
-template bool M_IsConvex(const Vector4*, const Vector4*);
-template void M_ComputeConvexHull(VectorIterator<Vector2>, VectorIterator<Vector2>,
-                                  std::vector<Vector2>&);
-template void M_ComputeConvexHull(VectorIterator<Vector3>, VectorIterator<Vector3>,
-                                  std::vector<Vector3>&);
-template void M_ComputeConvexHull(VectorIterator<Vector4>, VectorIterator<Vector4>,
-                                  std::vector<Vector4>&);
-template void M_ComputeConvexHull(VectorIterator<PointF>, VectorIterator<PointF>,
-                                  std::vector<PointF>&);
-template void M_ComputeConvexHull(const Vector2*, const Vector2*, std::vector<Vector2>&);
-template void M_ComputeConvexHull(const Vector3*, const Vector3*, std::vector<Vector3>&);
-template void M_ComputeConvexHull(const Vector4*, const Vector4*, std::vector<Vector4>&);
-template void M_ComputeConvexHull(const PointF*, const PointF*, std::vector<PointF>&);
+}  // namespace
+
+// A template is exported where it is defined.
+#pragma GCC visibility push(default)
+
+template <>
+bool M_IsConvex(const Vector2* first, const Vector2* last) {
+  return IsConvex(first, last);
+}
+template <>
+bool M_IsConvex(VectorIterator<Vector2> first, VectorIterator<Vector2> last) {
+  return IsConvex(first, last);
+}
+template <>
+bool M_IsConvex(const Vector3* first, const Vector3* last) {
+  return IsConvex(first, last);
+}
+template <>
+bool M_IsConvex(VectorIterator<Vector3> first, VectorIterator<Vector3> last) {
+  return IsConvex(first, last);
+}
+template <>
+bool M_IsConvex(const Vector4* first, const Vector4* last) {
+  return IsConvex(first, last);
+}
+template <>
+bool M_IsConvex(VectorIterator<Vector4> first, VectorIterator<Vector4> last) {
+  return IsConvex(first, last);
+}
+
+template <>
+void M_ComputeConvexHull(const Vector2* first, const Vector2* last, std::vector<Vector2>& out) {
+  FindHull(first, last, out);
+}
+template <>
+void M_ComputeConvexHull(VectorIterator<Vector2> first, VectorIterator<Vector2> last,
+                         std::vector<Vector2>& out) {
+  FindHull(first, last, out);
+}
+template <>
+void M_ComputeConvexHull(const Vector3* first, const Vector3* last, std::vector<Vector3>& out) {
+  FindHull(first, last, out);
+}
+template <>
+void M_ComputeConvexHull(VectorIterator<Vector3> first, VectorIterator<Vector3> last,
+                         std::vector<Vector3>& out) {
+  FindHull(first, last, out);
+}
+template <>
+void M_ComputeConvexHull(const Vector4* first, const Vector4* last, std::vector<Vector4>& out) {
+  FindHull(first, last, out);
+}
+template <>
+void M_ComputeConvexHull(VectorIterator<Vector4> first, VectorIterator<Vector4> last,
+                         std::vector<Vector4>& out) {
+  FindHull(first, last, out);
+}
+template <>
+void M_ComputeConvexHull(const PointF* first, const PointF* last, std::vector<PointF>& out) {
+  FindHull(first, last, out);
+}
+template <>
+void M_ComputeConvexHull(VectorIterator<PointF> first, VectorIterator<PointF> last,
+                         std::vector<PointF>& out) {
+  FindHull(first, last, out);
+}
 
 #pragma GCC visibility pop

@@ -17,10 +17,10 @@ constexpr double kQuarterTurn = 1.5707963267948966;
 // Kept on purpose: not one of the library's error codes.
 constexpr int32_t kZeroAxis = 3;
 
-// Divided by its length, which is returned; a zero vector stays as it is.
+// Makes it a unit vector, unless its length, which is returned, is 0.
 double Normalize(M_Vector3T<double>* v) {
   const double length = Mp::Length(*v);
-  if (length != 0) *v = Mp::Divided(*v, length);
+  if (length != 0) *v = Mp::Scaled(*v, 1.0 / length);
   return length;
 }
 
@@ -93,7 +93,9 @@ M_Matrix4 M_LookAtMatrix(const M_Vector3T<double>& eye, const M_Vector3T<double>
                          const M_Vector3T<double>& up) {
   static constexpr M_Vector3T<double> S_axis = {1, 0, 0};
   M_Vector3T<double> f = Mp::Difference(target, eye);
-  const double distance = Normalize(&f);
+  const double distance = Mp::Length(f);
+  // Divided, where s and u are multiplied by the reciprocal: the last bits may differ.
+  if (distance != 0) f = Mp::Divided(f, distance);
   M_Vector3T<double> s = Mp::Cross(up, f);
   M_Vector3T<double> u = Mp::Cross(f, s);
   const double lengthOfS = Normalize(&s);

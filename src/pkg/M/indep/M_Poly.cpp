@@ -143,14 +143,9 @@ double Cross(const Vector2& from1, const Vector2& to1, const Vector2& from2, con
   return (to1.x - from1.x) * (to2.y - from2.y) - (to1.y - from1.y) * (to2.x - from2.x);
 }
 
-}  // namespace
-
-// A template is exported where it is defined.
-#pragma GCC visibility push(default)
-
 template <class Point>
-int32_t M_IsFloatPointInConcavePoly(const Point* point, const Point* poly, int32_t count,
-                                    double tolerance, unsigned char* inside) {
+int32_t HitTest(const Point* point, const Point* poly, int32_t count, double tolerance,
+                unsigned char* inside) {
   *inside = 0;
   if (count < 1) return 0;
   try {
@@ -163,10 +158,21 @@ int32_t M_IsFloatPointInConcavePoly(const Point* point, const Point* poly, int32
   }
 }
 
-template int32_t M_IsFloatPointInConcavePoly(const M_Vector2T<double>*, const M_Vector2T<double>*,
-                                             int32_t, double, unsigned char*);
-template int32_t M_IsFloatPointInConcavePoly(const M_Vector2T<float>*, const M_Vector2T<float>*,
-                                             int32_t, double, unsigned char*);
+}  // namespace
+
+// A template is exported where it is defined.
+#pragma GCC visibility push(default)
+
+template <>
+int32_t M_IsFloatPointInConcavePoly(const M_Vector2T<double>* point, const M_Vector2T<double>* poly,
+                                    int32_t count, double tolerance, unsigned char* inside) {
+  return HitTest(point, poly, count, tolerance, inside);
+}
+template <>
+int32_t M_IsFloatPointInConcavePoly(const M_Vector2T<float>* point, const M_Vector2T<float>* poly,
+                                    int32_t count, double tolerance, unsigned char* inside) {
+  return HitTest(point, poly, count, tolerance, inside);
+}
 
 #pragma GCC visibility pop
 

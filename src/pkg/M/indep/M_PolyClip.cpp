@@ -1,5 +1,6 @@
 // One polygon clipped by another, edge by edge (Sutherland and Hodgman).
 
+#include <algorithm>
 #include <utility>
 #include <vector>
 
@@ -23,14 +24,14 @@ class ClipLine {
   double Side(const Point& q) const { return dx_ * q.y - dy_ * q.x + e_; }
 
   // Where the line through s and e meets this one; s if they are parallel. z and w lie between
-  // theirs.
+  // theirs, also where both are on one side: then one of them is close to the line and outside.
   Point Intersect(const Point& s, double sideOfS, const Point& e, double sideOfE) const {
     const double sx = e.x - s.x;
     const double sy = e.y - s.y;
     const double f = sy * s.x - sx * s.y;
     const double det = sx * dy_ - sy * dx_;
     if (Mp::IsNearZero(det)) return s;
-    const double t = sideOfS / (sideOfS - sideOfE);
+    const double t = std::clamp(sideOfS / (sideOfS - sideOfE), 0.0, 1.0);
     return {-(f * dx_ - e_ * sx) / det, (e_ * sy - f * dy_) / det, s.z + t * (e.z - s.z),
             s.w + t * (e.w - s.w)};
   }

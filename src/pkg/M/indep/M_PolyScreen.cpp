@@ -68,13 +68,8 @@ void ClearFlags(M_TransformPoly3D* poly) {
   for (unsigned char& flag : poly->clipped) flag = 0;
 }
 
-}  // namespace
-
-// A template is exported where it is defined.
-#pragma GCC visibility push(default)
-
 template <class Poly>
-double M_GetMinimumEdgeDistance(const M_Vector2T<double>* point, const Poly& poly) {
+double MinimumEdgeDistance(const M_Vector2T<double>* point, const Poly& poly) {
   double least = -1.0;
   for (int edge = 0; edge < kCorners; ++edge) {
     Vector2 start, end;
@@ -92,8 +87,19 @@ double M_GetMinimumEdgeDistance(const M_Vector2T<double>* point, const Poly& pol
   return least;
 }
 
-template double M_GetMinimumEdgeDistance(const M_Vector2T<double>*, const M_TransformPoly2D&);
-template double M_GetMinimumEdgeDistance(const M_Vector2T<double>*, const M_TransformPoly3D&);
+}  // namespace
+
+// A template is exported where it is defined.
+#pragma GCC visibility push(default)
+
+template <>
+double M_GetMinimumEdgeDistance(const M_Vector2T<double>* point, const M_TransformPoly2D& poly) {
+  return MinimumEdgeDistance(point, poly);
+}
+template <>
+double M_GetMinimumEdgeDistance(const M_Vector2T<double>* point, const M_TransformPoly3D& poly) {
+  return MinimumEdgeDistance(point, poly);
+}
 
 #pragma GCC visibility pop
 

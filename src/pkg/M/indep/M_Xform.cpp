@@ -375,6 +375,8 @@ MP_TARGET_AVX2 int32_t TransformWhileInsideWithAvx2(const M_Matrix3* m, int32_t 
 
 template <template <int> class Kernel, class Matrix, class Point>
 void TransformBatch(const Matrix* m, int32_t count, Point* points) {
+  // Without points there need be no matrix.
+  if (count < 1) return;
   if (Mp::HasAvx2()) return TransformWithAvx2<Kernel>(m, count, points);
   TransformWithBaseline<Kernel>(m, count, points);
 }
@@ -390,6 +392,7 @@ bool StoreRounded(double value, typename Traits::Coord* out) {
 
 template <class Traits>
 int32_t TransformIntegers(const M_Matrix3* m, int32_t count, typename Traits::Point* points) {
+  if (count < 1) return 0;
   const auto& a = m->m;
   const double tx = a[2][0] * Traits::kUnit;
   const double ty = a[2][1] * Traits::kUnit;

@@ -18,23 +18,29 @@ constexpr size_t kTrigBytes = kTrigEntries * sizeof(float);
 constexpr unsigned kChars = 256;
 constexpr size_t kCharTableBytes = size_t{kChars} * kChars;
 
-void FillTrig() {
+// A host that is short of memory may reclaim a block as soon as it has given it, or to give the
+// next one. Only what is there is filled; the rest is for the next prepare. Returns whether all is
+// there.
+bool FillTrig() {
   float* const table = static_cast<float*>(*Mp_G.trigTable);
-  for (size_t i = 0; i < kTrigEntries; ++i) {
+  for (size_t i = 0; table && i < kTrigEntries; ++i) {
     const double angle = (static_cast<double>(i) / 255.0) * (std::numbers::pi / 2);
     table[i] = static_cast<float>(std::sin(angle));
   }
+  return table;
 }
 
-void FillCharTables() {
-  auto* multiply = static_cast<unsigned char*>(*Mp_G.fcmTable);
-  auto* divide = static_cast<unsigned char*>(*Mp_G.fcdTable);
+bool FillCharTables() {
+  auto* const multiply = static_cast<unsigned char*>(*Mp_G.fcmTable);
+  auto* const divide = static_cast<unsigned char*>(*Mp_G.fcdTable);
   for (unsigned a = 0; a < kChars; ++a) {
     for (unsigned b = 0; b < kChars; ++b) {
-      *multiply++ = static_cast<unsigned char>((a * b + 127) / 255);
-      *divide++ = static_cast<unsigned char>(b < a ? (255 * b + a / 2) / a : 255);
+      const unsigned at = a * kChars + b;
+      if (multiply) multiply[at] = static_cast<unsigned char>((a * b + 127) / 255);
+      if (divide) divide[at] = static_cast<unsigned char>(b < a ? (255 * b + a / 2) / a : 255);
     }
   }
+  return multiply && divide;
 }
 
 void Free(U_Handle* handle) {
@@ -50,9 +56,7 @@ void FreeCharTables() {
 bool RebuildTrig() {
   Free(&Mp_G.trigTable);
   Mp_G.trigTable = U_AllocateHandleQuiet(kTrigBytes);
-  if (!Mp_G.trigTable) return false;
-  FillTrig();
-  return true;
+  return Mp_G.trigTable && FillTrig();
 }
 
 bool RebuildCharTables() {
@@ -63,8 +67,7 @@ bool RebuildCharTables() {
     FreeCharTables();
     return false;
   }
-  FillCharTables();
-  return true;
+  return FillCharTables();
 }
 
 bool HasTrig() { return (Mp_G.services & M_SERVICE_TRIG) && Mp_G.trigTable; }
