@@ -274,10 +274,9 @@ TEST_F(Polygons, NewPointsCarryWhatLiesBetween) {
   for (int round = 0; round < 300; ++round) {
     std::vector<V4> subject;
     for (int i = 0; i < 5; ++i) {
-      const double side =
-          generator_.OneOf({0.0, 1.0}) + Uniform(2) * generator_.OneOf({1e-6, 1e-9});
-      subject.push_back({Uniform(2), Uniform(2), Uniform(1), 0.5});
-      (generator_.Below(2) ? subject.back().x : subject.back().y) = side;
+      const double inwards = 1e-6 * (1 + Uniform(1e-3));
+      subject.push_back({0.5 + Uniform(1), 0.5 + Uniform(1), Uniform(1), 0.5});
+      (round % 2 ? subject.back().x : subject.back().y) = round % 4 < 2 ? inwards : 1 - inwards;
     }
     M_PolyPolyClip2D(&clipper, &subject, &result);
     for (const V4& p : result) ASSERT_TRUE(std::abs(p.z) <= 1 && p.w == 0.5) << round;
