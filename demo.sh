@@ -5,7 +5,7 @@ cd "$(dirname "$0")"
 . scripts/common.sh
 
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libbenchmark-dev pkg-config
-build_preset release --target comp catalogues
+build_preset release --target comp M_catalogues
 echo
 build/release/bin/comp examples/comp/samples/film.json examples/comp/samples/broadcast.json \
   examples/comp/samples/sound.json examples/comp/samples/stage.json examples/comp/samples/space.json
