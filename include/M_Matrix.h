@@ -1,36 +1,37 @@
 /// \file
 /// M_Matrix.h: vectors, matrices, rotations, planes, lines, polygons and hulls.
 ///
-/// Contents
-///   Vectors       M_Vector2T M_Vector3T M_Vector4T
-///   Matrices      M_Matrix3 M_Matrix4
-///   3x3 matrices  M_EqualMatrix M_EqualMatrixWithinEpsilon M_SetIdentityMatrix M_TranslateMatrix
-///                 M_RotateMatrix M_ScaleMatrix M_ConcatMatrix M_GetMatrixType
-///                 M_InverseMatrixQuiet M_InverseMatrix
-///   4x4 matrices  M_EqualMatrix4 M_ZeroMatrix4 M_IdentityMatrix4 M_SetMatrix4CoB M_ConcatMatrix4
-///                 M_TransposeMatrix4 M_GetMatrix4Determinant M_InverseMatrix4Quiet
-///                 M_InverseMatrix4 M_CalcNormalMatrix4Quiet M_CalcNormalMatrix4
-///                 M_TranslateMatrix4 M_ScaleMatrix4 M_Matrix3ToMatrix4 M_Matrix3ToMatrix4Uniform
-///   Decomposition M_DecomposeMatrix4 M_DecomposeMatrix4ZYX M_GetOrderedXYZRotationFromMatrix
-///                 M_Correct3DDecompFor2D
-///   Rotations     M_RotateMatrix4 M_RotateMatrix4XYZ M_RotateMatrix4XYZPlus
-///                 M_ConvertAxisAngleToOrderedXYZRotation M_LookAtMatrix
-///   Quaternions   M_QuatToMatrix4 M_Matrix4ToQuat M_Slerp
-///   Planes        M_GetPlaneEquation M_GetPlaneEquation2 M_RayIntersectPlane
-///   Lines         M_PerpDistTo2DLine M_Clip3DLine M_ClipLine2Rect
-///   Directions    M_ComputeDirectionalComponents M_VecToAngle M_Pt2Angle M_TransformPtF
-///   Polygons      M_IsFloatPointInConcavePoly M_IsFloatPointInQuad M_SignedPolygonArea2D
-///                 M_IsQuadEdgeOn M_PolyPolyClip2D
-///   Screen        M_TransformPoly2D M_TransformPoly3D M_GetMinimumEdgeDistance
-///                 M_TransformPoint2DtoScreen M_TransformPoint3DtoScreen
-///   Hulls         M_IsConvex M_ComputeConvexHull
-///
 /// Conventions: points are row vectors on the left, p' = p x M, so translation is in the last row,
 /// the homogeneous column is the last, and in a product A x B the transform A acts first. Products
 /// and sums are never fused. A value strictly between -1e-12 and 1e-12 counts as a zero length or
 /// w. A function that can fail returns a 32-bit code, 0 for success, or, as a member, throws it as
 /// an `int`. Pointers must not be null unless their comment says so; an output may be one of the
 /// inputs of its type. Everything may be called from any thread.
+
+// Contents
+//   Vectors       M_Vector2T M_Vector3T M_Vector4T
+//   Matrices      M_Matrix3 M_Matrix4
+//   3x3 matrices  M_EqualMatrix M_EqualMatrixWithinEpsilon M_SetIdentityMatrix M_TranslateMatrix
+//                 M_RotateMatrix M_ScaleMatrix M_ConcatMatrix M_GetMatrixType
+//                 M_InverseMatrixQuiet M_InverseMatrix
+//   4x4 matrices  M_EqualMatrix4 M_ZeroMatrix4 M_IdentityMatrix4 M_SetMatrix4CoB M_ConcatMatrix4
+//                 M_TransposeMatrix4 M_GetMatrix4Determinant M_InverseMatrix4Quiet
+//                 M_InverseMatrix4 M_CalcNormalMatrix4Quiet M_CalcNormalMatrix4
+//                 M_TranslateMatrix4 M_ScaleMatrix4 M_Matrix3ToMatrix4 M_Matrix3ToMatrix4Uniform
+//   Decomposition M_DecomposeMatrix4 M_DecomposeMatrix4ZYX M_GetOrderedXYZRotationFromMatrix
+//                 M_Correct3DDecompFor2D
+//   Rotations     M_RotateMatrix4 M_RotateMatrix4XYZ M_RotateMatrix4XYZPlus
+//                 M_ConvertAxisAngleToOrderedXYZRotation M_LookAtMatrix
+//   Quaternions   M_QuatToMatrix4 M_Matrix4ToQuat M_Slerp
+//   Planes        M_GetPlaneEquation M_GetPlaneEquation2 M_RayIntersectPlane
+//   Lines         M_PerpDistTo2DLine M_Clip3DLine M_ClipLine2Rect
+//   Directions    M_ComputeDirectionalComponents M_VecToAngle M_Pt2Angle M_TransformPtF
+//   Polygons      M_IsFloatPointInConcavePoly M_IsFloatPointInQuad M_SignedPolygonArea2D
+//                 M_IsQuadEdgeOn M_PolyPolyClip2D
+//   Screen        M_TransformPoly2D M_TransformPoly3D M_GetMinimumEdgeDistance
+//                 M_TransformPoint2DtoScreen M_TransformPoint3DtoScreen
+//   Hulls         M_IsConvex M_ComputeConvexHull
+
 #ifndef M_MATRIX_H
 #define M_MATRIX_H
 
@@ -48,25 +49,26 @@
 #pragma GCC visibility push(default)
 
 // ---------------------------------------------------------------------------------------------
-// Vectors
+/// \defgroup vectors Vectors
+/// \par Example
+/// \include vectors.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// A point or vector in the plane.
 template <class T>
 struct M_Vector2T {
-  /// To the right, and downwards, where nothing else is said.
-  T x;
-  T y;
+  T x;  ///< To the right.
+  T y;  ///< Downwards, where nothing else is said.
 };
 static_assert(sizeof(M_Vector2T<double>) == 16 && offsetof(M_Vector2T<double>, y) == 8);
 
 /// A point or vector in space, or a homogeneous point of the plane.
 template <class T>
 struct M_Vector3T {
-  /// To the right, downwards and away from the viewer, where nothing else is said.
-  T x;
-  T y;
-  T z;
+  T x;  ///< To the right.
+  T y;  ///< Downwards, where nothing else is said.
+  T z;  ///< Away from the viewer.
 };
 static_assert(sizeof(M_Vector3T<double>) == 24 && offsetof(M_Vector3T<double>, y) == 8);
 static_assert(offsetof(M_Vector3T<double>, z) == 16);
@@ -74,11 +76,10 @@ static_assert(offsetof(M_Vector3T<double>, z) == 16);
 /// A homogeneous point of space, or a direction where w is 0.
 template <class T>
 struct M_Vector4T {
-  /// As of M_Vector3T, and what these are divided by.
-  T x;
-  T y;
-  T z;
-  T w;
+  T x;  ///< To the right.
+  T y;  ///< Downwards, where nothing else is said.
+  T z;  ///< Away from the viewer.
+  T w;  ///< What the others are divided by.
 
   /// Scales x, y and z to unit length and keeps w. A w that is not 0 is reported, but no failure.
   /// Throws M_ERR_ZERO_VECTOR, after a report, when x^2 + y^2 + z^2 counts as zero; the vector is
@@ -88,25 +89,31 @@ struct M_Vector4T {
 static_assert(sizeof(M_Vector4T<double>) == 32 && offsetof(M_Vector4T<double>, y) == 8);
 static_assert(offsetof(M_Vector4T<double>, z) == 16 && offsetof(M_Vector4T<double>, w) == 24);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Matrices
+/// \defgroup matrices Matrices
+/// \par Example
+/// \include matrices.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// Nine doubles, row by row: a transform of (x, y, 1) with the translation in m[2].
 struct M_Matrix3 {
-  /// By row and column.
-  double m[3][3];
+  double m[3][3];  ///< By row and column.
 
   /// *p := (p x M) / w', each component divided, with z then 1. Throws M_ERR_W_IS_ZERO, after a
   /// report, when w' counts as zero; p is then untouched.
   void TransformPointAndDivide(M_Vector3T<double>* p) const;
 
-  /// The same for `count` points. The first that fails ends it: those before it are transformed,
-  /// it and those behind it untouched.
+  /// The same for `count` points. The first that fails ends it: those before it are transformed, it
+  /// and those behind it untouched.
   void TransformPointsAndDivide(int count, M_Vector3T<double>* pts) const;
 
-  /// The same without a look at w'; a w' of 0 gives infinities or NaNs.
+  /// *p := (p x M) / w' without a look at w'; a w' of 0 gives infinities or NaNs.
   void TransformPointAndDivideFast(M_Vector3T<double>* p) const;
+
+  /// The same for `count` points.
   void TransformPointsAndDivideFast(int count, M_Vector3T<double>* pts) const;
 
   /// Whether no |m[i][j]| > eps. A NaN passes.
@@ -124,8 +131,10 @@ struct M_Matrix3 {
   /// Makes this its adjugate: M x adj(M) = det(M) I.
   void Adjoint();
 
-  /// Element by element.
+  /// Adds element by element.
   M_Matrix3& operator+=(const M_Matrix3& other);
+
+  /// Subtracts element by element.
   M_Matrix3& operator-=(const M_Matrix3& other);
 
   /// The 2D part of a 3D transform: rows and columns 0, 1 and 3.
@@ -139,19 +148,20 @@ static_assert(sizeof(M_Matrix3) == 72);
 
 /// Sixteen doubles, row by row: a transform of (x, y, z, w) with the translation in m[3].
 struct M_Matrix4 {
-  /// By row and column.
-  double m[4][4];
+  double m[4][4];  ///< By row and column.
 
   /// *p := (p x M) x (1 / w'), with w then 1. Throws M_ERR_W_IS_ZERO, after a report, when w'
   /// counts as zero; p is then untouched.
   void TransformPointAndDivide(M_Vector4T<double>* p) const;
 
-  /// The same for `count` points. The first that fails ends it: those before it are transformed,
-  /// it and those behind it untouched.
+  /// The same for `count` points. The first that fails ends it: those before it are transformed, it
+  /// and those behind it untouched.
   void TransformPointsAndDivide(int count, M_Vector4T<double>* pts) const;
 
-  /// The same without a look at w'; a w' of 0 gives infinities or NaNs.
+  /// *p := (p x M) x (1 / w') without a look at w'; a w' of 0 gives infinities or NaNs.
   void TransformPointAndDivideFast(M_Vector4T<double>* p) const;
+
+  /// The same for `count` points.
   void TransformPointsAndDivideFast(int count, M_Vector4T<double>* pts) const;
 
   /// Whether no |m[i][j]| > eps. A NaN passes.
@@ -170,30 +180,45 @@ struct M_Matrix4 {
   /// Swaps rows and columns.
   void Transpose();
 
-  /// Element by element.
+  /// Adds element by element.
   M_Matrix4& operator+=(const M_Matrix4& other);
+
+  /// Subtracts element by element.
   M_Matrix4& operator-=(const M_Matrix4& other);
 };
 static_assert(sizeof(M_Matrix4) == 128);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Comparison within a tolerance. A NaN passes.
+/// \defgroup comparison_within_a_tolerance Comparison within a tolerance
+/// A NaN passes.
+/// \par Example
+/// \include comparison_within_a_tolerance.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// Whether no two elements differ by more than eps.
 bool M_EqualMatrixWithinEpsilon(const M_Matrix3& a, const M_Matrix3& b, double eps);
+/// Whether no two elements differ by more than eps.
 bool M_EqualMatrixWithinEpsilon(const M_Matrix4& a, const M_Matrix4& b, double eps);
 
 extern "C" {
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// 3x3 matrices: transforms of the plane
+/// \defgroup matrices_3x3 3x3 matrices
+/// Transforms of the plane.
+/// \par Example
+/// \include matrices_3x3.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// *equal = whether all elements are equal; a NaN equals nothing. Always 0.
 int32_t M_EqualMatrix(const M_Matrix3* a, const M_Matrix3* b, bool* equal);
 
-/// Always 0.
+/// m := the identity. Always 0.
 int32_t M_SetIdentityMatrix(M_Matrix3* m);
 
 /// m := m x T, with T[2] = (tx, ty, 1). Always 0.
@@ -211,7 +236,7 @@ int32_t M_ScaleMatrix(M_Matrix3* m, double sx, double sy, double cx, double cy);
 /// Always 0.
 int32_t M_ConcatMatrix(const M_Matrix3* a, M_Matrix3* b);
 
-/// What M_GetMatrixType tells, by exact comparison.
+/// What M_GetMatrixType() tells, by exact comparison.
 enum : uint32_t {
   M_MATRIX_IDENTITY = 0,         ///< Moves nothing.
   M_MATRIX_TRANSLATE = 1,        ///< Only the last row moves points.
@@ -230,20 +255,26 @@ int32_t M_GetMatrixType(const M_Matrix3* m, uint32_t* type);
 /// and dst half-way. `reportable` may be null. Never reports.
 int32_t M_InverseMatrixQuiet(const M_Matrix3* src, M_Matrix3* dst, bool* reportable);
 
-/// As M_InverseMatrixQuiet, and reports a failure.
+/// As M_InverseMatrixQuiet(), and reports a failure.
 int32_t M_InverseMatrix(const M_Matrix3* src, M_Matrix3* dst);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// 4x4 matrices: transforms of space
+/// \defgroup matrices_4x4 4x4 matrices
+/// Transforms of space.
+/// \par Example
+/// \include matrices_4x4.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// *equal = whether all elements are equal; a NaN equals nothing. Always 0.
 int32_t M_EqualMatrix4(const M_Matrix4* a, const M_Matrix4* b, bool* equal);
 
-/// Always 0.
+/// m := all zeros. Always 0.
 int32_t M_ZeroMatrix4(M_Matrix4* m);
 
-/// Always 0.
+/// m := the identity. Always 0.
 int32_t M_IdentityMatrix4(M_Matrix4* m);
 
 /// The change of basis whose first three columns are u, v and w: p x m = (p.u, p.v, p.w). Always 0.
@@ -253,10 +284,10 @@ int32_t M_SetMatrix4CoB(const M_Vector3T<double>* u, const M_Vector3T<double>* v
 /// out := a x b, so a's transform acts first (the 3x3 call is the other way round). Always 0.
 int32_t M_ConcatMatrix4(const M_Matrix4* a, const M_Matrix4* b, M_Matrix4* out);
 
-/// Always 0.
+/// dst := src with rows and columns swapped. Always 0.
 int32_t M_TransposeMatrix4(const M_Matrix4* src, M_Matrix4* dst);
 
-/// Expands along the first row. Always 0.
+/// *det = the determinant, expanded along the first row. Always 0.
 int32_t M_GetMatrix4Determinant(const M_Matrix4* m, double* det);
 
 /// dst := the inverse of src: the adjugate divided by the determinant. M_ERR_NOT_INVERTIBLE, with
@@ -264,14 +295,14 @@ int32_t M_GetMatrix4Determinant(const M_Matrix4* m, double* det);
 /// adjugate, not divided. `reportable` may be null. Never reports.
 int32_t M_InverseMatrix4Quiet(const M_Matrix4* src, M_Matrix4* dst, bool* reportable);
 
-/// As M_InverseMatrix4Quiet, and reports a failure.
+/// As M_InverseMatrix4Quiet(), and reports a failure.
 int32_t M_InverseMatrix4(const M_Matrix4* src, M_Matrix4* dst);
 
-/// dst := the transposed inverse of src, which transforms normals. Fails as M_InverseMatrix4Quiet;
-/// dst is then the transposed adjugate. Never reports.
+/// dst := the transposed inverse of src, which transforms normals. Fails as
+/// M_InverseMatrix4Quiet(); dst is then the transposed adjugate. Never reports.
 int32_t M_CalcNormalMatrix4Quiet(const M_Matrix4* src, M_Matrix4* dst, bool* reportable);
 
-/// As M_CalcNormalMatrix4Quiet, but reports a failure, and dst is then the adjugate as it is.
+/// As M_CalcNormalMatrix4Quiet(), but reports a failure, and dst is then the adjugate as it is.
 int32_t M_CalcNormalMatrix4(const M_Matrix4* src, M_Matrix4* dst);
 
 /// m := m x T, with T[3] = (tx, ty, tz, 1). Always 0.
@@ -283,11 +314,16 @@ int32_t M_ScaleMatrix4(M_Matrix4* m, double sx, double sy, double sz);
 /// The 2D transform as one of space that leaves z alone; its last column is dropped. Always 0.
 int32_t M_Matrix3ToMatrix4(const M_Matrix3* m3, M_Matrix4* m4);
 
-/// As M_Matrix3ToMatrix4, but where m3 scales x and y alike z is scaled alike, too. Always 0.
+/// As M_Matrix3ToMatrix4(), but where m3 scales x and y alike z is scaled alike, too. Always 0.
 int32_t M_Matrix3ToMatrix4Uniform(const M_Matrix3* m3, M_Matrix4* m4);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Decomposition
+/// \defgroup decomposition Decomposition
+/// \par Example
+/// \include decomposition.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// What was projected away, not divided by any scale.
@@ -310,26 +346,33 @@ static_assert(offsetof(M_Matrix4Decomp, shear) == 48 && offsetof(M_Matrix4Decomp
 
 /// *d := m / m[3][3] as L x R x T: L = {{sx, 0, 0}, {xy, sy, 0}, {xz, yz, sz}} of scale and shear
 /// (where the scales are negated for a mirror, L has the shears with the other sign), R = Rz x Ry x
-/// Rx, which M_RotateMatrix4XYZ makes of the angles, and the translation T.
+/// Rx, which M_RotateMatrix4XYZ() makes of the angles, and the translation T.
 /// M_ERR_NOT_DECOMPOSABLE, with all of *d zero, when m[3][3] is 0 or the rest of the last column,
 /// divided by it, is not. `failed` may be null: then a failure is reported. Otherwise it is set to
 /// 1 by a failure and left alone by a success. With a zero row there is no failure, but the angles
 /// mean little.
 int32_t M_DecomposeMatrix4(const M_Matrix4* m, M_Matrix4Decomp* d, unsigned char* failed);
 
-/// As M_DecomposeMatrix4, but with the angles of R = Rx x Ry x Rz. (Where y is a quarter turn and
+/// As M_DecomposeMatrix4(), but with the angles of R = Rx x Ry x Rz. (Where y is a quarter turn and
 /// row 2 nearly without y, but not quite, R may be half a turn off.)
 int32_t M_DecomposeMatrix4ZYX(const M_Matrix4* m, M_Matrix4Decomp* d, unsigned char* failed);
 
-/// The angles that M_DecomposeMatrix4 gives, in radians; zeros after a failure, which is reported.
+/// The angles that M_DecomposeMatrix4() gives, in radians; zeros after a failure, which is
+/// reported.
 int32_t M_GetOrderedXYZRotationFromMatrix(const M_Matrix4* m, double* rx, double* ry, double* rz);
 
 /// Turns half turns about x or y, which are flips of a layer in the plane, into a change of sign of
 /// the scale, and makes the z scale 1. Always 0.
 int32_t M_Correct3DDecompFor2D(M_Matrix4Decomp* d);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Rotations. Angles in radians; a positive one turns x towards y, y towards z and z towards x.
+/// \defgroup rotations Rotations
+/// Angles in radians; a positive one turns x towards y, y towards z and z towards x.
+/// \par Example
+/// \include rotations.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// m := m x R, the rotation about the axis (ax, ay, az), which need not be of unit length. An axis
@@ -338,27 +381,40 @@ int32_t M_Correct3DDecompFor2D(M_Matrix4Decomp* d);
 int32_t M_RotateMatrix4(M_Matrix4* m, double ax, double ay, double az, double radians);
 
 /// m := m x the rotation about x, then about y and z as they have been turned by then.
-/// M_RotateMatrix4's code if it fails; m is then untouched.
+/// M_RotateMatrix4()'s code if it fails; m is then untouched.
 int32_t M_RotateMatrix4XYZ(M_Matrix4* m, double rx, double ry, double rz);
 
-/// From the identity, as M_RotateMatrix4XYZ. Else about the directions of m's own axes, as m has
+/// From the identity, as M_RotateMatrix4XYZ(). Else about the directions of m's own axes, as m has
 /// them at each step (divided by w where that is not 0), through the origin; an axis that m takes
 /// to zero is left out. A failure's code is returned; m then holds the rotations made so far.
 int32_t M_RotateMatrix4XYZPlus(bool fromIdentity, M_Matrix4* m, double rx, double ry, double rz);
 
-/// The angles about x, y and z, as M_DecomposeMatrix4 has them, of a rotation about an axis. Fails
-/// as M_RotateMatrix4, with zeros.
+/// The angles about x, y and z, as M_DecomposeMatrix4() has them, of a rotation about an axis.
+/// Fails as M_RotateMatrix4(), with zeros.
 int32_t M_ConvertAxisAngleToOrderedXYZRotation(double ax, double ay, double az, double radians,
                                                double* rx, double* ry, double* rz);
 
-/// The orientation that looks from eye to target: rows sideways (up x forward), up and forward, and
-/// no translation. With up along the line of sight, or zero, the identity turned about x to look up
-/// or down; with eye at target, the identity.
+/// The orientation that looks from eye to target: rows sideways (up x forward), up (upright on the
+/// other two) and forward, and no translation. It takes directions as the eye has them to those of
+/// the world. What makes a camera takes points of the world to where the eye has them, which is the
+/// other way: subtract the eye (M_TranslateMatrix4()), then concatenate the transposed orientation.
+/// `up` becomes the eye's +y, which is downwards on a screen whose y runs downwards: an upright
+/// camera there has (0, 1, 0).
+///
+/// With up along the line of sight, or zero, the identity turned about x to look along y, up or
+/// down, whatever the line of sight; with eye at target, the identity. Only lengths of exactly 0
+/// are looked for: close to that, the directions sideways and up are what rounding leaves of them.
 M_Matrix4 M_LookAtMatrix(const M_Vector3T<double>& eye, const M_Vector3T<double>& target,
                          const M_Vector3T<double>& up);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Quaternions: four doubles x, y, z, w. All functions return 0. Outputs may be inputs.
+/// \defgroup quaternions Quaternions
+/// Four doubles x, y, z, w. All functions return 0. Outputs may be inputs.
+/// \par Example
+/// \include quaternions.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// The rotation of a unit quaternion; of another one, scaled by its squared length.
@@ -371,32 +427,35 @@ int32_t M_Matrix4ToQuat(const M_Matrix4* m, double* q);
 /// along the chord where |q0 . q1| is within 1e-5 of 1 (or above), and q0 where they are equal.
 int32_t M_Slerp(const double* q0, const double* q1, double* out, double t);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Planes and rays
+/// \defgroup planes_and_rays Planes and rays
+/// \par Example
+/// \include planes_and_rays.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// The plane a x + b y + c z + d = 0.
 struct M_PlaneEq {
-  /// The coefficients of x, y and z, and the constant.
-  double a;
-  double b;
-  double c;
-  double d;
+  double a;  ///< The normal's x.
+  double b;  ///< The normal's y.
+  double c;  ///< The normal's z.
+  double d;  ///< The constant.
 };
 static_assert(sizeof(M_PlaneEq) == 32 && offsetof(M_PlaneEq, d) == 24);
 
 /// From a point in a direction.
 struct M_Ray {
-  /// Homogeneous, with a w that is not looked at.
-  M_Vector4T<double> origin;
-  M_Vector4T<double> direction;
+  M_Vector4T<double> origin;     ///< A w is not looked at.
+  M_Vector4T<double> direction;  ///< Of any length; a w is not looked at.
 };
 static_assert(sizeof(M_Ray) == 64 && offsetof(M_Ray, direction) == 32);
 
 /// The plane of a polygon (Newell's method) through the mean of its points, which `centroid`
 /// receives unless it is null. The normal points to where the polygon is seen counter-clockwise. It
-/// has unit length, unless twice the area is at most 1e-12: then it is that long. Of no
-/// points the mean and d are NaNs. Always 0.
+/// has unit length, unless twice the area is at most 1e-12: then it is that long. Of no points the
+/// mean and d are NaNs; a negative count gives zeros. Always 0.
 int32_t M_GetPlaneEquation(const M_Vector3T<double>* points, int32_t count, M_PlaneEq* plane,
                            M_Vector3T<double>* centroid);
 
@@ -412,8 +471,13 @@ int32_t M_GetPlaneEquation2(const M_Vector3T<double>* point, const M_Vector3T<do
 int32_t M_RayIntersectPlane(const M_PlaneEq* plane, int32_t forwardOnly, const M_Ray* ray,
                             M_Vector3T<double>* hit, unsigned char* behind, unsigned char* ok);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Lines
+/// \defgroup lines Lines
+/// \par Example
+/// \include lines.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// *distance = that of the point from the line through a and b. `onSegment` may be null; it
@@ -436,16 +500,20 @@ int32_t M_Clip3DLine(const M_Vector3T<double>* p0, const M_Vector3T<double>* p1,
 int32_t M_ClipLine2Rect(const M_FloatRect* rect, M_Vector2T<double>* p0, M_Vector2T<double>* p1,
                         unsigned char* visible);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Directions. Bearings are in degrees where y runs downwards: 90 right, 180 down, 270 left, 360
-// straight up.
+/// \defgroup directions Directions
+/// Bearings are in degrees where y runs downwards: 90 right, 180 down, 270 left, 360 straight up.
+/// \par Example
+/// \include directions.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// What a matrix makes of the directions x and y.
 struct M_DirectionalComponents {
-  /// The images of (1, 0) and of (0, 1).
-  M_Vector2T<double> x;
-  M_Vector2T<double> y;
+  M_Vector2T<double> x;  ///< The image of (1, 0).
+  M_Vector2T<double> y;  ///< The image of (0, 1).
 };
 static_assert(sizeof(M_DirectionalComponents) == 32);
 
@@ -461,12 +529,17 @@ int32_t M_Pt2Angle(const M_FloatRect* rect, const M_Vector2T<double>* point, dou
 /// Rotates a point about a centre, from x towards y. `angle` in degrees. Always 0.
 int32_t M_TransformPtF(const M_Vector2T<float>* centre, double angle, M_Vector2T<float>* point);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Polygons in the plane. The last point joins the first; they may be concave and run either way
-// round.
+/// \defgroup polygons_in_the_plane Polygons in the plane
+/// The last point joins the first; they may be concave and run either way round.
+/// \par Example
+/// \include polygons_in_the_plane.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
-/// As M_IsFloatPointInConcavePoly for four points and no tolerance.
+/// As M_IsFloatPointInConcavePoly() for four points and no tolerance.
 int32_t M_IsFloatPointInQuad(const M_Vector2T<double>* point, const M_Vector2T<double>* quad,
                              unsigned char* inside);
 
@@ -482,67 +555,80 @@ int32_t M_IsQuadEdgeOn(const M_Matrix4* matrix, const M_Vector3T<double>* corner
 
 /// *result = the part of the subject inside the clipper, which must be convex and may run either
 /// way round. Points within 1e-6 of a side, in the measure of its cross product, count as outside.
-/// z and w of a new point are interpolated, or where both neighbours are that close to the side
-/// extrapolated, between theirs. An empty clipper clips nothing; fewer than three points of a
-/// subject are nothing. The result may be one of the others; it is what it was if an allocation
-/// fails, which throws.
+/// z and w of a new point lie between those of its neighbours. An empty clipper clips nothing;
+/// fewer than three points of a subject are nothing.
+///
+/// Nothing has an inside where a side has no length: a clipper with a repeated point, or one that
+/// closes with its first, gives an empty result. So does one that runs clockwise with y upwards and
+/// is so small (some 1e-3 across) that the same measure of its first side and its centre is within
+/// 1e-6: it is turned round although it ran the right way.
+///
+/// The result may be one of the others; it is what it was if an allocation fails, which throws.
 void M_PolyPolyClip2D(const std::vector<M_Vector4T<double>>* clipper,
                       const std::vector<M_Vector4T<double>>* subject,
                       std::vector<M_Vector4T<double>>* result);
-
-/// Through `first`, then `second`; the third columns are not used. Always true.
-bool M_TransformPoint2DtoScreen(const M_Matrix3& first, const M_Matrix3& second,
-                                M_Vector2T<double>* point);
 
 }  // extern "C"
 
 /// *inside = whether the point lies in the polygon, for points of double and of float:
 ///
-///   inside                                              1
-///   nearly on an edge that is not upright               1
-///   on an upright edge, on the side of larger x         1
-///   on an upright edge, on the side of smaller x        0
+/// | point | *inside |
+/// |---|---|
+/// | inside | 1 |
+/// | nearly on an edge that is not upright | 1 |
+/// | on an upright edge, on the side of larger x | 1 |
+/// | on an upright edge, on the side of smaller x | 0 |
 ///
 /// An edge's end at the smaller x is not part of it: a corner from which both edges lead to larger
 /// x is decided by the other edges, and 0 where it sticks out.
 ///
 /// With a tolerance (its sign does not matter) also what lies that close to a corner, or to an edge
-/// in the sense of M_PerpDistTo2DLine. A polygon whose points are all the same is that point. A
+/// in the sense of M_PerpDistTo2DLine(). A polygon whose points are all the same is that point. A
 /// count below 1 gives 0. Returns 0, or what the host answers to an exception when there is no
-/// memory for more than 64 points, with *inside 0.
+/// memory for more than 64 points, with *inside 0. Points of any other type are refused when this
+/// is compiled.
 template <class Point>
 int32_t M_IsFloatPointInConcavePoly(const Point* point, const Point* poly, int32_t count,
                                     double tolerance, unsigned char* inside);
+/// The same for pointers that convert to those above.
 template <class Point, class Poly>
 int32_t M_IsFloatPointInConcavePoly(Point point, Poly poly, int32_t count, double tolerance,
                                     unsigned char* inside);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Quads on the screen. What they call throws its error code as an `int`.
+/// \defgroup quads_on_the_screen Quads on the screen
+/// What they call throws its error code as an `int`.
+/// \par Example
+/// \include quads_on_the_screen.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// A quad on the screen. Edge i leads from corner i to the next.
 class M_TransformPoly2D {
  public:
-  M_TransformPoly2D();  ///< Visible; the corners are left unset.
-  virtual ~M_TransformPoly2D();
+  M_TransformPoly2D();           ///< Visible; the corners are left unset.
+  virtual ~M_TransformPoly2D();  ///< Virtual, for what is derived from it.
 
-  /// As M_IsFloatPointInConcavePoly; false for a quad that is not visible.
+  /// As M_IsFloatPointInConcavePoly(); false for a quad that is not visible.
   bool IsPointInside(const M_Vector2T<double>* point, double tolerance) const;
+
+  /// M_GetMinimumEdgeDistance() of this quad, be it visible or not.
   double GetMinimumEdgeDistance(const M_Vector2T<double>* point) const;
 
   M_Vector2T<double> points[4];  ///< The corners, in order.
   bool visible;                  ///< Set by the client.
 };
 
-/// A quad in space on its way to the screen. Fill in `points`; then TransformPointsToEye,
-/// TransformPointsToScreen, and InitPolyPoints before the outline is used. A first or second row of
-/// a matrix that is zero (a squared length within 1e-12 of it) changes nothing but the clipped
-/// flags, which are cleared.
+/// A quad in space on its way to the screen. Fill in `points`; then TransformPointsToEye(),
+/// TransformPointsToScreen(), and InitPolyPoints() before the outline is used. A first or second
+/// row of a matrix that is zero (a squared length within 1e-12 of it) changes nothing but the
+/// clipped flags, which are cleared.
 class M_TransformPoly3D {
  public:
-  M_TransformPoly3D();  ///< Nothing clipped, no outline; the corners are left unset.
-  virtual ~M_TransformPoly3D();
+  M_TransformPoly3D();           ///< Nothing clipped, no outline; the corners are left unset.
+  virtual ~M_TransformPoly3D();  ///< Gives the outline back to the host.
 
   /// Takes the corners to where the eye sees them.
   void TransformPointsToEye(const M_Matrix4& toEye);
@@ -561,16 +647,23 @@ class M_TransformPoly3D {
 
   bool IsVisible() const;  ///< Not all corners are clipped.
 
-  /// False, with *out untouched, for a corner that is clipped, or an edge whose corners both are.
+  /// *out = a corner; false, with *out untouched, for one that is clipped.
   bool GetPoint(int corner, M_Vector2T<double>* out) const;
+
+  /// *out = the part of an edge that is not clipped; false, with *out untouched, where none is.
   bool GetEdge(int edge, std::pair<M_Vector2T<double>, M_Vector2T<double>>* out) const;
 
-  /// The outline as it is. The index is not checked.
+  /// How many points the outline has, as it is.
   int NumPolyPoints() const;
+
+  /// *out = a point of the outline as it is. The index is not checked.
   void GetPolyPoint(int index, M_Vector2T<double>* out) const;
 
-  /// As M_IsFloatPointInConcavePoly for the outline as it is; false where there is none.
+  /// As M_IsFloatPointInConcavePoly() for the outline as it is; false where there is none, and
+  /// while all four corners are clipped, whatever the outline.
   bool IsPointInside(const M_Vector2T<double>* point, double tolerance) const;
+
+  /// M_GetMinimumEdgeDistance() of this quad: by its corners and flags, not by its outline.
   double GetMinimumEdgeDistance(const M_Vector2T<double>* point) const;
 
   M_Vector3T<double> points[4];      ///< In the world, then as the eye sees them, then on screen.
@@ -581,11 +674,18 @@ class M_TransformPoly3D {
   mutable bool polyPointsValid;  ///< polyPoints is the outline. It is empty where it is not.
 };
 
-/// The distance of a point from the nearest visible edge of a quad; -1 where there is none. It is
-/// that of M_PerpDistTo2DLine where that says the point is beside the edge, else that from the
+/// The distance of a point from the nearest visible edge of a M_TransformPoly2D, all of whose edges
+/// are, or a M_TransformPoly3D, or of what is derived from them; -1 where there is none. It is
+/// that of M_PerpDistTo2DLine() where that says the point is beside the edge, else that from the
 /// nearer end.
 template <class Poly>
 double M_GetMinimumEdgeDistance(const M_Vector2T<double>* point, const Poly& poly);
+
+extern "C" {
+/// Through `first`, then `second`; the third columns are not used. Always true.
+bool M_TransformPoint2DtoScreen(const M_Matrix3& first, const M_Matrix3& second,
+                                M_Vector2T<double>* point);
+}
 
 /// Through toEye, projection and toScreen, divided by w after the first and the last. False, with
 /// the point unchanged, when the eye sees it before the near plane. Throws M_ERR_W_IS_ZERO, after a
@@ -597,17 +697,23 @@ bool M_TransformPoint3DtoScreen(const M_Matrix4& toEye, const M_Matrix4& project
 bool M_TransformPoint3DtoScreen(const M_Matrix4& toEye, const M_Matrix4& projection,
                                 const M_Matrix3& toScreen, M_Vector2T<double>* point);
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// Hulls and convexity. By x and y. The ranges are const iterators of a vector, or const pointers,
-// of M_Vector2T, M_Vector3T or M_Vector4T of double, and for hulls of qelcore::geom::PointT<float>.
+/// \defgroup hulls_and_convexity Hulls and convexity
+/// By x and y. The ranges are given by iterators of a std::vector, or pointers, of M_Vector2T,
+/// M_Vector3T or M_Vector4T of double, and for hulls of `qelcore::geom::PointT<float>`. Both ends
+/// may be const or not; anything else is refused when it is compiled.
+/// \par Example
+/// \include hulls_and_convexity.cpp
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 /// A point on the lattice of hulls: from 0 to 2^29 in each direction, or up to half as much again
 /// where the steps are the smallest numbers there are.
 struct M_LongPoint {
-  /// Steps from the least coordinate of the axis.
-  int32_t x;
-  int32_t y;
+  int32_t x;  ///< Steps from the least x.
+  int32_t y;  ///< Steps from the least y.
 };
 static_assert(sizeof(M_LongPoint) == 8 && offsetof(M_LongPoint, y) == 4);
 
@@ -616,6 +722,7 @@ static_assert(sizeof(M_LongPoint) == 8 && offsetof(M_LongPoint, y) == 4);
 /// not noticed: a pentagram is convex.
 template <class Iterator>
 bool M_IsConvex(Iterator first, Iterator last);
+/// The same for ends of which one is const.
 template <class First, class Last>
 bool M_IsConvex(First first, Last last);
 
@@ -628,8 +735,11 @@ bool M_IsConvex(First first, Last last);
 template <class Iterator>
 void M_ComputeConvexHull(Iterator first, Iterator last,
                          std::vector<typename std::iterator_traits<Iterator>::value_type>& out);
+/// The same for ends of which one is const.
 template <class First, class Last, class Out>
 void M_ComputeConvexHull(First first, Last last, Out& out);
+
+/// \}
 
 #pragma GCC visibility pop
 

@@ -15,7 +15,8 @@
 #pragma GCC visibility push(default)
 
 // ---------------------------------------------------------------------------------------------
-// What M calls
+/// \defgroup host_interface What M calls
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 extern "C" {
@@ -26,7 +27,7 @@ typedef void** U_Handle;
 /// A block of `bytes` bytes. Null on failure, which is reported under `id` with the name.
 U_Handle U_AllocateHandle(uint32_t id, const char* name, size_t bytes);
 
-/// As U_AllocateHandle, without a report.
+/// As U_AllocateHandle(), without a report.
 U_Handle U_AllocateHandleQuiet(size_t bytes);
 
 /// Frees the handle and its block. Null is allowed.
@@ -38,7 +39,7 @@ void U_FreeHandle(U_Handle handle);
 const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t, int32_t);
 
 /// The calling thread's buffer, in which a message stands when it is reported. It holds any text of
-/// U_ZLookupLStrCache with any other filled in.
+/// U_ZLookupLStrCache() with any other filled in.
 char* Up_GetThreadLoggingBuffer(void);
 
 /// Sets the calling thread's last error.
@@ -48,10 +49,10 @@ void Up_SetThreadLastError(int32_t error);
 /// returned.
 int32_t Up_ReportError(uint32_t id, int32_t severity);
 
-/// As Up_ReportError with a text of its own, which may be null.
+/// As Up_ReportError() with a text of its own, which may be null.
 int32_t Up_ReportErrString(uint32_t id, int32_t severity, const char* text);
 
-/// As Up_ReportErrString for one of the host's error numbers, which is returned and becomes the
+/// As Up_ReportErrString() for one of the host's error numbers, which is returned and becomes the
 /// last error.
 int32_t Up_ReportVarkErrString(uint32_t id, int32_t severity, int32_t hostError, const char* text);
 
@@ -79,6 +80,7 @@ class U_Allocator {
 
   /// All are alike.
   U_Allocator() = default;
+  /// \copydoc U_Allocator
   template <class Other>
   U_Allocator(const U_Allocator<Other>&) {}
 
@@ -102,8 +104,11 @@ bool operator!=(const U_Allocator<T>&, const U_Allocator<Other>&) {
   return false;
 }
 
+/// \}
+
 // ---------------------------------------------------------------------------------------------
-// What this stand-in offers beyond that
+/// \defgroup host_stand_in What this stand-in offers beyond that
+/// \{
 // ---------------------------------------------------------------------------------------------
 
 extern "C" {
@@ -113,11 +118,10 @@ void U_ReclaimHandle(U_Handle handle);
 
 /// What is allocated. Reclaimed blocks count as handles of 0 bytes.
 struct U_MemoryUse {
-  /// Numbers and sizes of what is not freed.
-  size_t handles;
-  size_t handleBytes;
-  size_t trackedBlocks;
-  size_t trackedBytes;
+  size_t handles;        ///< Not freed.
+  size_t handleBytes;    ///< Of their blocks.
+  size_t trackedBlocks;  ///< Not freed.
+  size_t trackedBytes;   ///< Of these.
 };
 /// What is allocated at this moment.
 U_MemoryUse U_GetMemoryUse(void);
@@ -125,25 +129,28 @@ U_MemoryUse U_GetMemoryUse(void);
 /// The calling thread's last error: 0, an identifier or a host error number.
 int32_t Up_GetThreadLastError(void);
 
-/// One report. `hostError` is 0 where there is none, `text` never null.
+/// One report.
 struct U_Report {
-  /// As the report was made; the text in the user's language.
-  uint32_t id;
-  int32_t severity;
-  int32_t hostError;
-  const char* text;
+  uint32_t id;        ///< Who reports: for M 0x110000 and the number of the place.
+  int32_t severity;   ///< 8 an error, 4 a warning.
+  int32_t hostError;  ///< One of the host's error numbers, or 0.
+  const char* text;   ///< In the user's language; never null.
 };
 
 /// Receives every report, on the thread that reports, while it is reported; it may report in turn.
-/// A null callback stands for a line on standard error. A callback that was replaced may still be
-/// running on another thread.
 typedef void (*U_ReportCallback)(void* context, const U_Report* report);
+
+/// From now on `callback` receives every report, with `context`. Null stands for a line on standard
+/// error. A callback that was replaced may still be running on another thread.
 void U_SetReportCallback(U_ReportCallback callback, void* context);
 
-/// Receives every log line, in the same way; but a null callback stands for a line on standard
-/// error only where the environment has a variable U_LOG when the first line comes.
+/// Receives every log line, on the thread that logs.
 typedef void (*U_LogCallback)(void* context, int32_t level, const char* component,
                               const char* event, const char* text);
+
+/// From now on `callback` receives every log line, as U_SetReportCallback() has it. Null stands for
+/// a line on standard error where the environment has a variable U_LOG when the first line comes,
+/// and for nothing where it has none.
 void U_SetLogCallback(U_LogCallback callback, void* context);
 
 /// Where the translations are: the folder above LANGUAGE/LC_MESSAGES/COMPONENT.mo. Null stands for
@@ -152,6 +159,8 @@ void U_SetLogCallback(U_LogCallback callback, void* context);
 void U_SetMessageFolder(const char* folder);
 
 }  // extern "C"
+
+/// \}
 
 #pragma GCC visibility pop
 
