@@ -1,7 +1,7 @@
 #!/bin/sh
 # Installs what is missing, builds, and runs every test.
 # --all: also with clang++ and clang-tidy, with the sanitizers, as a static library with baseline vectors
-# only, and unoptimised; makes the reference, and fuzzes for a moment.
+# only, and unoptimised; makes the reference, fuzzes for a moment, and tries the packages.
 # --everywhere: instead, whether all builds on all processors give the same bits.
 # --fuzz SECONDS: instead, the fuzz targets, each for so long.
 set -eu
@@ -58,4 +58,5 @@ if [ "$presets" != release ]; then
   ./docs.sh
   . scripts/fuzz.sh
   fuzz 8
+  ./package.sh --try
 fi

@@ -24,7 +24,7 @@ got: $2"
 cmake --install "$build" --prefix "$work/first" >/dev/null
 mv "$work/first" "$work/moved"
 export CMAKE_GENERATOR=Ninja
-export PKG_CONFIG_PATH="$work/moved/$libdir/pkgconfig" LD_LIBRARY_PATH="$work/moved/$libdir"
+export PKG_CONFIG_PATH="$work/moved/$libdir/pkgconfig"
 if [ -e "$work/moved/$libdir/libM.so" ]; then
   (cd "$work/moved" && find . -type f -o -type l) | sed "s:^\./$libdir:lib:; s:^\./::; s:MTargets-[a-z]*:MTargets-CONFIG:; s:\.so\.[0-9]\+\.[0-9.]*[0-9]:.so.VERSION:" | sort >"$work/files"
   [ -e "$work/moved/share/locale" ] || sed '/^share.locale/d' "$source/tests/installed_files.txt" >"$work/expected"
@@ -41,9 +41,10 @@ plain='5/6
 cmake -S "$source/examples/minimal" -B "$work/cmake" -DCMAKE_PREFIX_PATH="$work/moved" \
   -DCMAKE_CXX_COMPILER="$compiler" -DCMAKE_CXX_FLAGS="$flags" >/dev/null
 cmake --build "$work/cmake" >/dev/null
-expect "$plain" "$(env -u LD_LIBRARY_PATH "$work/cmake/minimal")"
+expect "$plain" "$("$work/cmake/minimal")"
 
-"$compiler" $flags "$source/examples/minimal/main.cpp" $(pkg-config --cflags --libs --static M) -o "$work/by_pkg_config"
+"$compiler" $flags "$source/examples/minimal/main.cpp" $(pkg-config --cflags --libs --static M) \
+  -Wl,-rpath,"$(pkg-config --variable=libdir M)" -o "$work/by_pkg_config"
 expect "$plain" "$("$work/by_pkg_config")"
 
 cmake -S "$source/examples/comp" -B "$work/comp" -DCMAKE_PREFIX_PATH="$work/moved" \
