@@ -500,8 +500,6 @@ void FindHull(Iterator first, Iterator last, std::vector<T>& out) {
   out.swap(result);
 }
 
-template <class T>
-using VectorIterator = typename std::vector<T>::const_iterator;
 using Vector2 = M_Vector2T<double>;
 using Vector3 = M_Vector3T<double>;
 using Vector4 = M_Vector4T<double>;
@@ -517,7 +515,8 @@ bool M_IsConvex(const Vector2* first, const Vector2* last) {
   return IsConvex(first, last);
 }
 template <>
-bool M_IsConvex(VectorIterator<Vector2> first, VectorIterator<Vector2> last) {
+bool M_IsConvex(std::vector<Vector2>::const_iterator first,
+                std::vector<Vector2>::const_iterator last) {
   return IsConvex(first, last);
 }
 template <>
@@ -525,7 +524,8 @@ bool M_IsConvex(const Vector3* first, const Vector3* last) {
   return IsConvex(first, last);
 }
 template <>
-bool M_IsConvex(VectorIterator<Vector3> first, VectorIterator<Vector3> last) {
+bool M_IsConvex(std::vector<Vector3>::const_iterator first,
+                std::vector<Vector3>::const_iterator last) {
   return IsConvex(first, last);
 }
 template <>
@@ -533,7 +533,8 @@ bool M_IsConvex(const Vector4* first, const Vector4* last) {
   return IsConvex(first, last);
 }
 template <>
-bool M_IsConvex(VectorIterator<Vector4> first, VectorIterator<Vector4> last) {
+bool M_IsConvex(std::vector<Vector4>::const_iterator first,
+                std::vector<Vector4>::const_iterator last) {
   return IsConvex(first, last);
 }
 
@@ -542,8 +543,8 @@ void M_ComputeConvexHull(const Vector2* first, const Vector2* last, std::vector<
   FindHull(first, last, out);
 }
 template <>
-void M_ComputeConvexHull(VectorIterator<Vector2> first, VectorIterator<Vector2> last,
-                         std::vector<Vector2>& out) {
+void M_ComputeConvexHull(std::vector<Vector2>::const_iterator first,
+                         std::vector<Vector2>::const_iterator last, std::vector<Vector2>& out) {
   FindHull(first, last, out);
 }
 template <>
@@ -551,8 +552,8 @@ void M_ComputeConvexHull(const Vector3* first, const Vector3* last, std::vector<
   FindHull(first, last, out);
 }
 template <>
-void M_ComputeConvexHull(VectorIterator<Vector3> first, VectorIterator<Vector3> last,
-                         std::vector<Vector3>& out) {
+void M_ComputeConvexHull(std::vector<Vector3>::const_iterator first,
+                         std::vector<Vector3>::const_iterator last, std::vector<Vector3>& out) {
   FindHull(first, last, out);
 }
 template <>
@@ -560,8 +561,8 @@ void M_ComputeConvexHull(const Vector4* first, const Vector4* last, std::vector<
   FindHull(first, last, out);
 }
 template <>
-void M_ComputeConvexHull(VectorIterator<Vector4> first, VectorIterator<Vector4> last,
-                         std::vector<Vector4>& out) {
+void M_ComputeConvexHull(std::vector<Vector4>::const_iterator first,
+                         std::vector<Vector4>::const_iterator last, std::vector<Vector4>& out) {
   FindHull(first, last, out);
 }
 template <>
@@ -569,8 +570,8 @@ void M_ComputeConvexHull(const PointF* first, const PointF* last, std::vector<Po
   FindHull(first, last, out);
 }
 template <>
-void M_ComputeConvexHull(VectorIterator<PointF> first, VectorIterator<PointF> last,
-                         std::vector<PointF>& out) {
+void M_ComputeConvexHull(std::vector<PointF>::const_iterator first,
+                         std::vector<PointF>::const_iterator last, std::vector<PointF>& out) {
   FindHull(first, last, out);
 }
 
