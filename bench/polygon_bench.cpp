@@ -287,7 +287,7 @@ void Clipping() {
 // ---------------------------------------------------------------------------------------------
 
 constexpr size_t kLayers = 64;
-constexpr double kNear = 0.1;
+[[maybe_unused]] constexpr double kNear = 0.1;
 
 struct Layer {
   Vector3 corners[4];
