@@ -359,9 +359,10 @@ int32_t M_MulRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned ch
 
 /// *out = a / b by multiplying with b's reciprocal, with the predictions and approximations of
 /// M_MulRatio(): 2000000000/1 by 1/1 overflows, too. A negative b makes the reciprocal's den its
-/// bit pattern, 2^31 or more. A zero b is a zero denominator; a b without denominator gives 0. A
-/// b.den of 2^31 or more needs permission to be halved, and then 2 is ORed into the status byte;
-/// without it the result is an overflow, and 1 is ORed into what the status byte holds.
+/// bit pattern, 2^31 or more. A zero b is a zero denominator; a b without denominator gives 0, or
+/// where it is negative perhaps an overflow. A b.den of 2^31 or more needs permission to be halved,
+/// and then 2 is ORed into the status byte; without it the result is an overflow, and 1 is ORed
+/// into what the status byte holds.
 int32_t M_DivRatio(const M_Ratio* a, const M_Ratio* b, M_Ratio* out, unsigned char* status);
 
 /// *out = 1 / in; out may be in. `exact` receives 1, or 0 when in.den is 2^31 or more and nothing

@@ -1,69 +1,82 @@
 #include "TestHost.h"
 
-#include <algorithm>
+#include <gtest/gtest.h>
+
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <new>
 
 #include "Mp_Strs.h"
-#include "U.h"
 #include "XLOG.h"
 
-TestHost host;
+thread_local TestHost host;
+thread_local TestMemory memory;
 
 namespace {
 
-char buffer[4096];
-int32_t lastError = 99;
+thread_local char buffer[4096];
+thread_local int32_t lastError = 99;
 
 template <class... Args>
 void Note(const char* format, Args... args) {
   char text[sizeof buffer + 100];
   std::snprintf(text, sizeof text, format, args...);
   host.calls.emplace_back(text);
-  ++host.touches;
+  if (host.state) host.calls.back().append(host.state());
 }
+
+int32_t Answer(int32_t usual) { return host.answers < 0 ? usual : host.answers; }
 
 // Filled, so that a table nobody has filled is noticed.
 U_Handle Allocate(size_t bytes) {
-  ++host.allocations;
-  if (std::count(host.failing.begin(), host.failing.end(), host.allocations)) return nullptr;
-  if (std::count(host.reclaiming.begin(), host.reclaiming.end(), host.allocations)) {
-    std::free(std::exchange(*host.lastHandle, nullptr));
-  }
-  ++host.handles;
-  return host.lastHandle = new void*(std::memset(std::malloc(bytes), 0xEE, bytes));
+  const bool fails = host.failing & 1;
+  if (host.reclaiming & 1 && !host.handles.empty()) Reclaim(host.handles.back());
+  host.failing >>= 1;
+  host.reclaiming >>= 1;
+  if (fails) return nullptr;
+  host.handles.push_back(new void*(std::memset(std::malloc(bytes), 0xEE, bytes)));
+  return host.handles.back();
 }
 
 }  // namespace
 
+void Reclaim(U_Handle handle) { std::free(std::exchange(*handle, nullptr)); }
+
+void FreeHandles() {
+  for (; !host.handles.empty(); host.handles.pop_back()) {
+    Reclaim(host.handles.back());
+    delete host.handles.back();
+  }
+}
+
 void* operator new(size_t bytes) {
-  ++host.news;
-  const bool fails = host.newToFail > 0 && --host.newToFail == 0;
+  ++memory.news;
+  const bool fails = memory.newToFail > 0 && --memory.newToFail == 0;
   void* const block = fails ? nullptr : std::malloc(bytes);
   if (!block) throw std::bad_alloc();
-  ++host.blocks;
+  ++memory.blocks;
   return block;
 }
 void operator delete(void* block) noexcept {
-  if (block) --host.blocks;
+  if (block) --memory.blocks;
   std::free(block);
 }
-void* U_MemTrackedObject::TrackedNew(size_t bytes, bool) {
-  ++host.trackedBlocks;
-  return std::malloc(host.trackedBytes = bytes);
-}
-void U_MemTrackedObject::TrackedDelete(void* block) {
-  --host.trackedBlocks;
-  std::free(block);
-}
-
+void operator delete(void* block, size_t) noexcept { operator delete(block); }
 // Named, too, because a sanitizer's own does not come here.
 void* operator new[](size_t bytes) { return operator new(bytes); }
 void operator delete[](void* block) noexcept { operator delete(block); }
 void operator delete[](void* block, size_t) noexcept { operator delete(block); }
-void operator delete(void* block, size_t) noexcept { operator delete(block); }
+
+void* U_MemTrackedObject::TrackedNew(size_t bytes, bool mayFail) {
+  EXPECT_FALSE(mayFail);
+  ++memory.trackedBlocks;
+  return std::malloc(memory.trackedBytes = bytes);
+}
+void U_MemTrackedObject::TrackedDelete(void* block) {
+  --memory.trackedBlocks;
+  std::free(block);
+}
 
 extern "C" {
 
@@ -78,28 +91,22 @@ U_Handle U_AllocateHandleQuiet(size_t bytes) {
 }
 
 void U_FreeHandle(U_Handle handle) {
-  Note("%s", "free");
-  std::free(*handle);
+  Note("free");
+  EXPECT_EQ(std::erase(host.handles, handle), 1u) << "freed, but not given";
+  Reclaim(handle);
   delete handle;
-  --host.handles;
 }
 
 const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t x, int32_t y) {
-  ++host.touches;
   EXPECT_EQ(x | y, 0);
-  const auto* const strings = static_cast<const Mp_StrHeader*>(header);
-  EXPECT_STREQ(strings->component, "M");
-  if (index < 0 || static_cast<uint64_t>(index) + 1 >= strings->count) return "(no such text)";
-  return std::strchr(strings->table[index].key, '=') + 1;
+  EXPECT_EQ(header, &M_G_zhdr);
+  if (index < 0 || static_cast<uint64_t>(index) + 1 >= M_G_zhdr.count) return "(no such text)";
+  return std::strchr(M_G_zhdr.table[index].key, '=') + 1;
 }
 
-char* Up_GetThreadLoggingBuffer(void) {
-  ++host.touches;
-  return buffer;
-}
+char* Up_GetThreadLoggingBuffer(void) { return buffer; }
 
 void Up_SetThreadLastError(int32_t error) {
-  ++host.touches;
   lastError = error;
   std::strcpy(buffer, "(not written)");
 }
@@ -107,26 +114,26 @@ void Up_SetThreadLastError(int32_t error) {
 int32_t Up_ReportError(uint32_t id, int32_t severity) {
   EXPECT_EQ(std::exchange(lastError, 99), 0) << "cleared before a message is written";
   Note("%x %d %s", id, severity, buffer);
-  return 77;
+  return Answer(77);
 }
 
 int32_t Up_ReportErrString(uint32_t id, int32_t severity, const char* text) {
   Note("%x %d %s", id, severity, text);
-  return 78;
+  return Answer(78);
 }
 
 int32_t Up_ReportVarkErrString(uint32_t id, int32_t severity, int32_t hostError, const char* text) {
   Note("%x %d host %d %s", id, severity, hostError, text ? text : "-");
-  return host.reportResult != 0 ? host.reportResult : hostError;
+  return Answer(hostError);
 }
 
 int32_t U_TranslateAndReportException(const std::exception& thrown) {
   Note("exception %s", thrown.what());
-  return 79;
+  return Answer(79);
 }
 
 int64_t WideMultiply(int32_t a, int32_t b) {
-  ++host.touches;
+  Note("multiply %d %d", a, b);
   return int64_t{a} * b;
 }
 

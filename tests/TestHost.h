@@ -1,10 +1,9 @@
 /// \file
-/// A host of the tests' own, which takes the stand-in's place in their executable: it notes every
-/// call as text and fails on request.
+/// A host of the tests' own, which takes the stand-in's place in their executable. It records every
+/// call in order, with its arguments and the library's state at that moment, answers what a test
+/// wants, fails any allocation and reclaims at any moment. Each thread has its own.
 #ifndef TESTS_TEST_HOST_H
 #define TESTS_TEST_HOST_H
-
-#include <gtest/gtest.h>
 
 #include <cstdint>
 #include <string>
@@ -13,31 +12,31 @@
 
 #include "U.h"
 
-struct TestHost {
-  std::vector<std::string> calls;  ///< Reports, log lines and calls about memory, in order.
-  int touches = 0;                 ///< Calls of any kind.
-  int allocations = 0;             ///< Attempts to allocate a handle.
-  std::vector<int> failing;        ///< Attempts that fail, counted from 1.
-  std::vector<int> reclaiming;     ///< Attempts at which the block given before is reclaimed.
-  U_Handle lastHandle = nullptr;   ///< What was given before.
-  int handles = 0;                 ///< Handles not freed.
-  int trackedBlocks = 0;           ///< Tracked blocks not freed.
-  size_t trackedBytes = 0;         ///< Of the last one.
-  int news = 0;                    ///< Calls of operator new.
-  int newToFail = 0;               ///< Which of the next ones fails; 0 for none.
-  int blocks = 0;                  ///< Blocks of operator new not freed.
-  int32_t reportResult = 0;        ///< What reports with a host error return; 0: the host error.
-  std::vector<std::string> Take() { return std::exchange(calls, {}); }
-};
-extern TestHost host;
-
 using Calls = std::vector<std::string>;
 
-/// Begins every test with a fresh host and ends it with every call looked at.
-class HostTest : public ::testing::Test {
- protected:
-  void SetUp() override { host = {}; }
-  void TearDown() override { EXPECT_EQ(host.calls, Calls()) << "calls that no test asked for"; }
+struct TestHost {
+  Calls calls;                       ///< In order, as text.
+  std::string (*state)() = nullptr;  ///< What to append to each call.
+  int answers = -1;                  ///< What reports return; -1 for what is usual.
+  unsigned failing = 0;           ///< Allocations of handles that fail, a bit each; the first is 1.
+  unsigned reclaiming = 0;        ///< Allocations at which the block given before is reclaimed.
+  std::vector<U_Handle> handles;  ///< Given, and not freed.
+  Calls Take() { return std::exchange(calls, {}); }
 };
+extern thread_local TestHost host;
+
+/// Takes a block away, as a host may; frees all handles.
+void Reclaim(U_Handle handle);
+void FreeHandles();
+
+/// Memory of this thread: plain operator new, and the host's tracked blocks.
+struct TestMemory {
+  int news;             ///< Calls of operator new.
+  int newToFail;        ///< Which of the next ones fails; 0 for none.
+  int blocks;           ///< Of operator new, not freed.
+  int trackedBlocks;    ///< Not freed.
+  size_t trackedBytes;  ///< Of the last one.
+};
+extern thread_local TestMemory memory;
 
 #endif  // TESTS_TEST_HOST_H
