@@ -58,7 +58,7 @@ std::vector<V2> HullOf(const std::vector<V2>& points) {
     own.push_back({});
     own.back().x = static_cast<decltype(Point::x)>(p.x),
     own.back().y = static_cast<decltype(Point::y)>(p.y);
-    if constexpr (requires(Point p) { p.z; }) own.back().z = 5;
+    if constexpr (requires(Point q) { q.z; }) own.back().z = 5;
   }
   M_ComputeConvexHull(own.cbegin(), own.cend(), hull);
   std::vector<Point> byPointers;
@@ -68,7 +68,7 @@ std::vector<V2> HullOf(const std::vector<V2>& points) {
   Check(byPointers.size() == hull.size() && own.size() == hull.size());
   for (size_t i = 0; i < hull.size(); ++i) {
     Check(BitsOf(byPointers[i]) == BitsOf(hull[i]) && BitsOf(own[i]) == BitsOf(hull[i]));
-    if constexpr (requires(Point p) { p.z; }) Equal(hull[i].z, (points.size() > 3 ? 0 : 5));
+    if constexpr (requires(Point q) { q.z; }) Equal(hull[i].z, (points.size() > 3 ? 0 : 5));
     result.push_back({hull[i].x, hull[i].y});
   }
   return result;

@@ -89,22 +89,22 @@ std::string CallAt(void* const* places, Result (*)(Parameters...), std::index_se
 }
 
 /// The description of a function by its signature.
-template <auto kFunction, CallOptions kOptions, class Result, class... Parameters>
-Function Describe(Result (*)(Parameters...)) {
-  Function f = {NameOf<kFunction>(), kOptions, {}, [](void* const* places) {
+template <auto kFunction, class Result, class... Parameters>
+Function Describe(Result (*)(Parameters...), const CallOptions& options) {
+  Function f = {NameOf<kFunction>(), options, {}, [](void* const* places) {
                   return CallAt<kFunction>(places, +kFunction,
                                            std::index_sequence_for<Parameters...>());
                 }};
   const auto add = [&]<class P>() {
     using Target = std::remove_pointer_t<std::remove_reference_t<P>>;
     const auto k = f.parameters.size();
-    const bool isMany = kOptions.many >> k & 1;
+    const bool isMany = options.many >> k & 1;
     f.parameters.push_back(
         {&kType<std::remove_cv_t<Target>>, std::is_pointer_v<P> || std::is_reference_v<P>,
-         std::is_pointer_v<P> && !std::is_const_v<Target>, (kOptions.inOut >> k & 1) != 0,
-         !isMany              ? 1u
-         : kOptions.count < 0 ? 4u
-                              : 7u});
+         std::is_pointer_v<P> && !std::is_const_v<Target>, (options.inOut >> k & 1) != 0,
+         !isMany             ? 1u
+         : options.count < 0 ? 4u
+                             : 7u});
   };
   (add.template operator()<Parameters>(), ...);
   return f;

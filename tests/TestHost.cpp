@@ -91,7 +91,7 @@ U_Handle U_AllocateHandleQuiet(size_t bytes) {
 }
 
 void U_FreeHandle(U_Handle handle) {
-  Note("free");
+  Note("%s", "free");
   EXPECT_EQ(std::erase(host.handles, handle), 1u) << "freed, but not given";
   Reclaim(handle);
   delete handle;

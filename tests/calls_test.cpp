@@ -11,8 +11,6 @@
 
 namespace {
 
-constexpr CallOptions kBatch = {.inOut = 4, .count = 1, .many = 4};
-
 // Members, by a pointer or a reference to their object.
 using M3 = M_Matrix3;
 using M4 = M_Matrix4;
@@ -48,26 +46,26 @@ constexpr auto kQuad = +[](const V2* p, const V2* quad, unsigned char* inside) {
   return M_IsFloatPointInQuad(p, quad, inside);
 };
 
-template <auto kFunction, CallOptions kOptions = CallOptions{}>
-Function F() {
-  return Describe<kFunction, kOptions>(kFunction);
+template <auto kFunction>
+Function F(const CallOptions& options = {}) {
+  return Describe<kFunction>(kFunction, options);
 }
 template <auto kFunction>
 Function InOut() {
-  return F<kFunction, {.inOut = 1}>();
+  return F<kFunction>({.inOut = 1});
 }
 template <auto kFunction>
 Function InOut2() {
-  return F<kFunction, {.inOut = 2}>();
+  return F<kFunction>({.inOut = 2});
 }
 template <auto kFunction>
 Function Batch() {
-  return F<kFunction, kBatch>();
+  return F<kFunction>({.inOut = 4, .count = 1, .many = 4});
 }
 // The status byte is permission and outcome.
 template <auto kFunction>
 Function Sum() {
-  return F<kFunction, {.inOut = 8}>();
+  return F<kFunction>({.inOut = 8});
 }
 
 void Expect(bool holds, const Function& f, const Function::Values& given, const std::string& what) {
@@ -156,19 +154,19 @@ const Function kAll[] = {
     F<M_RoundDoubleSafe>(),
     F<M_RoundDouble64>(),
     F<M_fmod>(),
-    F<M_ReduceRatio, {.nullable = 4}>(),
+    F<M_ReduceRatio>({.nullable = 4}),
     Sum<M_AddRatio>(),
     Sum<M_SubRatio>(),
     Sum<M_MulRatio>(),
     Sum<M_DivRatio>(),
-    F<M_RecipRatio, {.nullable = 4}>(),
+    F<M_RecipRatio>({.nullable = 4}),
     F<M_CompareRatio>(),
     F<M_MinRatio>(),
     F<M_MaxRatio>(),
-    F<M_FpLong2Ratio, {.nullable = 2}>(),
-    F<M_ConvRatio, {.nullable = 8, .isKept = true}>(),
+    F<M_FpLong2Ratio>({.nullable = 2}),
+    F<M_ConvRatio>({.nullable = 8, .isKept = true}),
     F<M_ShortConvRatio>(),
-    F<M_ClipRatio, {.isKept = true}>(),
+    F<M_ClipRatio>({.isKept = true}),
     F<M_ClipRatioToSpan>(),
     F<M_ClipSpanToSpan>(),
     F<Mp_Double2RatioSmart>(),
@@ -214,10 +212,10 @@ const Function kAll[] = {
     F<M_LPt2Rect>(),
     F<M_FixedPt2Rect>(),
     F<M_PtToAngle>(),
-    F<M_SectRect, {.nullable = 4}>(),
-    F<M_SectLRect, {.nullable = 4}>(),
-    F<M_SectFixedRect, {.nullable = 4}>(),
-    F<M_SectFloatRect, {.nullable = 4}>(),
+    F<M_SectRect>({.nullable = 4}),
+    F<M_SectLRect>({.nullable = 4}),
+    F<M_SectFixedRect>({.nullable = 4}),
+    F<M_SectFloatRect>({.nullable = 4}),
     F<M_RectCompare>(),
     F<M_LRectCompare>(),
     F<M_FixedRectCompare>(),
@@ -229,7 +227,7 @@ const Function kAll[] = {
     F<M_FixedRect2LRectOut>(),
     F<M_Rect2FixedRect>(),
     F<M_LRect2FixedRect>(),
-    F<M_LRect2Rect, {.isKept = true}>(),
+    F<M_LRect2Rect>({.isKept = true}),
     Batch<M_TransformFloatPoints>(),
     Batch<M_TransformPoints>(),
     Batch<M_TransformFixPoints>(),
@@ -238,18 +236,18 @@ const Function kAll[] = {
     Batch<M_TransformVector4>(),
     Batch<M_Transform3DFloatPoints>(),
     Batch<M_3DTransform2DPoints>(),
-    F<M_TransformRect, {.inOut = 2, .nullable = 12, .many = 4}>(),
-    F<M_TransformFloatRect, {.inOut = 2, .nullable = 12, .many = 4}>(),
-    F<M_TransformFixRect, {.inOut = 2, .nullable = 12, .isKept = true, .many = 4}>(),
+    F<M_TransformRect>({.inOut = 2, .nullable = 12, .many = 4}),
+    F<M_TransformFloatRect>({.inOut = 2, .nullable = 12, .many = 4}),
+    F<M_TransformFixRect>({.inOut = 2, .nullable = 12, .isKept = true, .many = 4}),
     F<M_TransformBounds>(),
     InOut<kNormalize>(),
-    F<kDivide3, {.inOut = 2}>(),
+    F<kDivide3>({.inOut = 2}),
     Batch<kDivideAll3>(),
-    F<kDivideFast3, {.inOut = 2}>(),
+    F<kDivideFast3>({.inOut = 2}),
     Batch<kDivideAllFast3>(),
-    F<kDivide4, {.inOut = 2}>(),
+    F<kDivide4>({.inOut = 2}),
     Batch<kDivideAll4>(),
-    F<kDivideFast4, {.inOut = 2}>(),
+    F<kDivideFast4>({.inOut = 2}),
     Batch<kDivideAllFast4>(),
     InOut<kAdjoint>(),
     InOut<kTranspose3>(),
@@ -269,7 +267,7 @@ const Function kAll[] = {
     InOut<M_ScaleMatrix>(),
     InOut2<M_ConcatMatrix>(),
     F<M_GetMatrixType>(),
-    F<M_InverseMatrixQuiet, {.nullable = 4}>(),
+    F<M_InverseMatrixQuiet>({.nullable = 4}),
     F<M_InverseMatrix>(),
     F<M_EqualMatrix4>(),
     F<M_ZeroMatrix4>(),
@@ -278,44 +276,44 @@ const Function kAll[] = {
     F<M_ConcatMatrix4>(),
     F<M_TransposeMatrix4>(),
     F<M_GetMatrix4Determinant>(),
-    F<M_InverseMatrix4Quiet, {.nullable = 4}>(),
+    F<M_InverseMatrix4Quiet>({.nullable = 4}),
     F<M_InverseMatrix4>(),
-    F<M_CalcNormalMatrix4Quiet, {.nullable = 4}>(),
+    F<M_CalcNormalMatrix4Quiet>({.nullable = 4}),
     F<M_CalcNormalMatrix4>(),
     InOut<M_TranslateMatrix4>(),
     InOut<M_ScaleMatrix4>(),
     F<M_Matrix3ToMatrix4>(),
     F<M_Matrix3ToMatrix4Uniform>(),
-    F<M_DecomposeMatrix4, {.isKept = true}>(),
-    F<M_DecomposeMatrix4ZYX, {.isKept = true}>(),
+    F<M_DecomposeMatrix4>({.isKept = true}),
+    F<M_DecomposeMatrix4ZYX>({.isKept = true}),
     F<M_GetOrderedXYZRotationFromMatrix>(),
     InOut<M_Correct3DDecompFor2D>(),
     InOut<M_RotateMatrix4>(),
     InOut<M_RotateMatrix4XYZ>(),
-    F<M_RotateMatrix4XYZPlus, {.inOut = 2}>(),
+    F<M_RotateMatrix4XYZPlus>({.inOut = 2}),
     F<M_ConvertAxisAngleToOrderedXYZRotation>(),
     F<M_LookAtMatrix>(),
-    F<M_QuatToMatrix4, {.many = 1}>(),
-    F<M_Matrix4ToQuat, {.many = 2}>(),
-    F<M_Slerp, {.many = 7}>(),
-    F<M_GetPlaneEquation, {.nullable = 8, .count = 1, .many = 1}>(),
+    F<M_QuatToMatrix4>({.many = 1}),
+    F<M_Matrix4ToQuat>({.many = 2}),
+    F<M_Slerp>({.many = 7}),
+    F<M_GetPlaneEquation>({.nullable = 8, .count = 1, .many = 1}),
     F<M_GetPlaneEquation2>(),
-    F<M_RayIntersectPlane, {.nullable = 16}>(),
-    F<M_PerpDistTo2DLine, {.nullable = 8}>(),
+    F<M_RayIntersectPlane>({.nullable = 16}),
+    F<M_PerpDistTo2DLine>({.nullable = 8}),
     F<M_Clip3DLine>(),
-    F<M_ClipLine2Rect, {.inOut = 6}>(),
+    F<M_ClipLine2Rect>({.inOut = 6}),
     F<M_ComputeDirectionalComponents>(),
     F<M_VecToAngle>(),
     F<M_Pt2Angle>(),
-    F<M_TransformPtF, {.inOut = 4}>(),
-    F<kQuad, {.many = 2}>(),
-    F<M_SignedPolygonArea2D, {.count = 1, .many = 1}>(),
-    F<M_IsQuadEdgeOn, {.many = 2}>(),
-    F<kInPoly, {.count = 2, .many = 2}>(),
-    F<kInPolyF, {.count = 2, .many = 2}>(),
-    F<M_TransformPoint2DtoScreen, {.inOut = 4}>(),
-    F<kToScreen3, {.inOut = 8}>(),
-    F<kToScreen2, {.inOut = 8}>()};
+    F<M_TransformPtF>({.inOut = 4}),
+    F<kQuad>({.many = 2}),
+    F<M_SignedPolygonArea2D>({.count = 1, .many = 1}),
+    F<M_IsQuadEdgeOn>({.many = 2}),
+    F<kInPoly>({.count = 2, .many = 2}),
+    F<kInPolyF>({.count = 2, .many = 2}),
+    F<M_TransformPoint2DtoScreen>({.inOut = 4}),
+    F<kToScreen3>({.inOut = 8}),
+    F<kToScreen2>({.inOut = 8})};
 
 TEST(Calls, OutputsMayStandInInputs) {
   for (const Function& f : kAll) Holds([&] { TestPlaces(f); }, 0.05);
