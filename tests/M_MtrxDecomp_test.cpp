@@ -135,6 +135,14 @@ TEST(MtrxDecomp, GimbalLock) {
   m = {{{0, 0, 0, 0}, {0, 2, 0, 0}, {0, 0, 2, 0}, {0, 0, 0, 1}}};
   EXPECT_EQ(M_DecomposeMatrix4(&m, &d, nullptr), 0);
   EXPECT_TRUE(d.scale.x == 0 && d.scale.y == 2 && d.scale.z == 2);
+  // Lengths that are so small that rounding makes a sine of more than 1 of them.
+  for (double tiny = 1e-162; tiny < 1e-160; tiny *= 1.1) {
+    m = {{{0, 0, tiny, 0}, {0, 1, 0, 0}, {tiny, 0, 0, 0}, {0, 0, 0, 1}}};
+    for (const auto decompose : {M_DecomposeMatrix4, M_DecomposeMatrix4ZYX}) {
+      decompose(&m, &d, nullptr);
+      ASSERT_FALSE(std::isnan(d.rotate.y)) << tiny;
+    }
+  }
   // A flip: all scales, and half a turn.
   m = {{{-1, 0, 0, 0}, {0, 1, 0, 0}, {0, 0, 1, 0}, {0, 0, 0, 1}}};
   M_DecomposeMatrix4(&m, &d, nullptr);

@@ -275,6 +275,12 @@ TEST(Mtrx, SmallPivotsAndDeterminants) {
     Equal(M_InverseMatrix4Quiet(&m4, &inverse4, nullptr),
           (std::abs(determinant) < 1e-16 ? M_ERR_NOT_INVERTIBLE : 0));
   });
+  // A NaN is not small.
+  M_Matrix3 nan3 = {{{kNan, 0, 0}, {0, kNan, 0}, {0, 0, kNan}}};
+  M_Matrix4 nan4 = {{{kNan}}};
+  EXPECT_EQ(
+      M_InverseMatrixQuiet(&nan3, &nan3, nullptr) | M_InverseMatrix4Quiet(&nan4, &nan4, nullptr),
+      0);
   // Of equal pivots the later row, which what is left half-way shows; there rows are not in order.
   const std::tuple<M_Matrix3, int32_t, M_Matrix3> rows[] = {
       {{{{1, 1, 0}, {1, 1, 0}, {1, 1, 5}}},

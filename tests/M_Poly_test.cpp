@@ -144,13 +144,17 @@ TEST(Poly, LimitsOfTheHitTest) {
   EXPECT_EQ(Hit({3, 4}, {{0, 0}}, 5), 1);
   EXPECT_EQ(Hit({3, 4}, {{0, 0}}, std::nextafter(5.0, 4.0)), 0);
   EXPECT_EQ(Hit({kNan, 4}, {{kNan, 4}}, 0), 0);
-  // The distance of single points is measured as they are.
-  const F2 p = {0.1f, 0}, q = {0.3f, 0};
-  unsigned char inside = 9;
-  for (const auto& [tolerance, isInside] : {std::pair(0.2f, 1), {std::nextafter(0.2f, 0.0f), 0}}) {
+  // The distance of single floats is measured in floats.
+  Holds([](Real x, Real y, Real a, Real b) {
+    const F2 p = {static_cast<float>(x), static_cast<float>(y)};
+    const F2 q = {static_cast<float>(a), static_cast<float>(b)};
+    const float dx = p.x - q.x, dy = p.y - q.y, apart = dx * dx + dy * dy;
+    const double tolerance = *operands::Near(rc::gen::just(std::sqrt(double{apart})));
+    unsigned char inside = 9;
     M_IsFloatPointInConcavePoly(&p, &q, 1, tolerance, &inside);
-    EXPECT_EQ(inside, (0.3f - 0.1f) * (0.3f - 0.1f) <= double{tolerance} * tolerance) << isInside;
-  }
+    Equal(inside, apart == 0 || tolerance * tolerance >= apart);
+  });
+  unsigned char inside;
   for (const int32_t count : {0, -1}) {
     inside = 9;
     EXPECT_EQ(M_IsFloatPointInConcavePoly(&square[0], &square[0], count, 9.0, &inside), 0);

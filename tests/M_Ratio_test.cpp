@@ -91,6 +91,7 @@ void HoldsForPairs(const Check& check) {
     }
     if (kind > 6) b.den = a.den;
     if (kind == 6) b.num = a.num, b.den = a.den ^ 1;
+    if (kind == 5) b = {INT32_MIN, a.den};
     if (b.den == 0) b.den = 1;
     check(a, b);
   });

@@ -135,6 +135,7 @@ inline Gen<uint32_t> Words() {
     return kind == 1   ? top
            : kind == 2 ? top - 1
            : kind == 3 ? top + 1
+           : kind == 5 ? (random % 4 << 30) - (random >> 8) % 2  // The ends, and half of them.
            : kind == 4 ? word & ~((1u << random % static_cast<uint32_t>(bits)) - 1)
                        : word;
   });

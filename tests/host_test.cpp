@@ -112,11 +112,13 @@ TEST(Reporting, GoesToTheCallbackAndTheLastError) {
   EXPECT_EQ(Up_ReportVarkErrString(0x13, 8, -5, nullptr), -5);
   EXPECT_EQ(Up_GetThreadLastError(), -5);
   EXPECT_EQ(U_TranslateAndReportException(std::bad_alloc()), 4);
+  EXPECT_EQ(U_TranslateAndReportException(std::bad_array_new_length()), 4);
   EXPECT_EQ(U_TranslateAndReportException(std::runtime_error("odd")), 1);
   Up_SetThreadLastError(9);
   EXPECT_EQ(Up_GetThreadLastError(), 9);
-  EXPECT_EQ(reports.all, (Texts{"11 4 0 in the buffer", "12 8 0 given", "13 8 -5 ",
-                                "10000 8 4 std::bad_alloc", "10000 8 1 odd"}));
+  EXPECT_EQ(reports.all,
+            (Texts{"11 4 0 in the buffer", "12 8 0 given", "13 8 -5 ", "10000 8 4 std::bad_alloc",
+                   "10000 8 4 std::bad_array_new_length", "10000 8 1 odd"}));
 }
 
 TEST(Reporting, MayReportInTurn) {
