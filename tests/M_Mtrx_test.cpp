@@ -276,7 +276,7 @@ TEST(Mtrx, SmallPivotsAndDeterminants) {
           (std::abs(determinant) < 1e-16 ? M_ERR_NOT_INVERTIBLE : 0));
   });
   // A NaN is not small.
-  M_Matrix3 nan3 = {{{kNan, 0, 0}, {0, kNan, 0}, {0, 0, kNan}}};
+  M_Matrix3 nan3 = {{{kNan, 0, 0}, {kNan, kNan, 0}, {kNan, kNan, kNan}}};
   M_Matrix4 nan4 = {{{kNan}}};
   EXPECT_EQ(
       M_InverseMatrixQuiet(&nan3, &nan3, nullptr) | M_InverseMatrix4Quiet(&nan4, &nan4, nullptr),
