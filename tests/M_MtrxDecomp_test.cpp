@@ -68,6 +68,9 @@ TEST(MtrxDecomp, ComposesBack) {
         M_RotateMatrix4XYZ(&composed, d.rotate.x, d.rotate.y, d.rotate.z);
       }
       M_TranslateMatrix4(&composed, d.translate.x, d.translate.y, d.translate.z);
+      // Close to a quarter turn little is left of the other two angles.
+      const double cosine = std::abs(std::cos(d.rotate.y));
+      RC_PRE(cosine > 1e-3 || cosine < 1e-9);
       Check(M_EqualMatrixWithinEpsilon(composed, given, 1e-6));
       double x, y, z;
       if (isZyx) continue;

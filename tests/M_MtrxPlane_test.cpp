@@ -148,7 +148,7 @@ TEST(MtrxPlane, LinesAreCutToRectangles) {
   Holds([&](Digit l, Digit t, Digit w, Digit h) {
     const M_FloatRect r = {l * 1.0, t * 1.0, l + w + 5.0, t + h + 5.0};
     const auto coordinate = [](double low, double high) {
-      return *rc::gen::oneOf(operands::Reals(), operands::Near(rc::gen::element(low, high)));
+      return *rc::gen::oneOf(operands::Reals(), rc::gen::element(low, high));
     };
     const V2 a = {coordinate(r.left, r.right), coordinate(r.top, r.bottom)},
              b = {coordinate(r.left, r.right), coordinate(r.top, r.bottom)};
@@ -173,8 +173,8 @@ TEST(MtrxPlane, LinesAreCutToRectangles) {
     };
     narrow(a.x, b.x, r.left, r.right);
     narrow(a.y, b.y, r.top, r.bottom);
-    RC_PRE(std::abs(leave - enter) > 1e-9 && std::abs(a.x - b.x) > 1e-6 &&
-           std::abs(a.y - b.y) > 1e-6);
+    RC_PRE(std::abs(leave - enter) > 1e-6);
+    RC_PRE(std::abs(a.x - b.x) > 1e-3 && std::abs(a.y - b.y) > 1e-3);
     Equal(visible, (enter < leave));
     const auto at = [&](double s) { return V3{a.x + s * (b.x - a.x), a.y + s * (b.y - a.y), 0}; };
     if (visible) {

@@ -49,7 +49,7 @@ TEST(MtrxRotate, AboutAnAxis) {
     M_Matrix4 both = given, product;
     M_RotateMatrix4(&both, axis.x, axis.y, axis.z, angle);
     M_ConcatMatrix4(&given, &m, &product);
-    Equal(BitsOf(both), BitsOf(product));
+    Check(M_EqualMatrixWithinEpsilon(both, product, 0));
     double x, y, z;
     Equal(M_ConvertAxisAngleToOrderedXYZRotation(axis.x, axis.y, axis.z, angle, &x, &y, &z), 0);
     M_Matrix4 ordered = Identity();
