@@ -35,11 +35,11 @@ everywhere_one() {
       everywhere_failures=$((everywhere_failures + 1))
     }
   fi
-  libm=$(grep -c 'as they may' "$folder.differences" || true)
+  libm=$(grep -c 'as it may' "$folder.differences" || true)
   printf '%-32s %s' "$name" "$result"
-  if [ "$libm" -gt 0 ]; then printf ', but for %s libm areas' "$libm"; fi
+  if [ "$libm" -gt 0 ]; then printf ', but for %s libm functions' "$libm"; fi
   echo
-  grep -v 'as they may' "$folder.differences" || true
+  grep -v 'as it may' "$folder.differences" || true
 }
 
 everywhere() {

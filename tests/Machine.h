@@ -67,7 +67,7 @@ struct Function {
 template <auto kFunction>
 std::string NameOf() {
   const std::string_view text = __PRETTY_FUNCTION__;
-  const size_t start = text.find("kFunction = ") + 12;
+  const size_t start = text.find_first_not_of(" =&", text.find("kFunction") + 9);
   return std::string(text.substr(start, text.find_first_of(";]", start) - start));
 }
 

@@ -4,6 +4,7 @@
 #define DIGEST_AREA_H
 
 #include <array>
+#include <string>
 #include <tuple>
 #include <utility>
 #include <vector>
@@ -31,12 +32,24 @@ struct Slot {
   }
 };
 
+/// Names of functions with the digests of what they give.
+using Digests = std::vector<std::pair<std::string, uint64_t>>;
+
+/// The name of a function, as the compiler has it.
+template <auto kFunction>
+std::string NameOf() {
+  const std::string text = __PRETTY_FUNCTION__;
+  const size_t start = text.find_first_not_of(" =&", text.find("kFunction") + 9);
+  return text.substr(start, text.find_first_of(";]", start) - start);
+}
+
 class Area {
  public:
-  explicit Area(uint64_t seed) : operands_(seed) {}
-
-  uint64_t Value() const { return digest_; }
+  const Digests& Values() const { return digests_; }
   Operands& operands() { return operands_; }
+
+  /// Begins the digest of a function, with operands that no other has a part in.
+  void Begin(const std::string& name);
 
   /// All NaNs are alike: which of them an operation gives is the processor's choice.
   template <class Record>
@@ -58,8 +71,14 @@ class Area {
   /// is left as it was counts. The parameters that are bits of `nullable`, the first is 1, are left
   /// out at times.
   template <class Result, class... Parameters>
-  void Call(Result (*function)(Parameters...), unsigned nullable = 0) {
+  void Call(const std::string& name, Result (*function)(Parameters...), unsigned nullable = 0) {
+    Begin(name);
     CallAs<Result, Parameters...>(function, nullable, std::index_sequence_for<Parameters...>());
+  }
+
+  template <auto kFunction>
+  void Call(unsigned nullable = 0) {
+    Call(NameOf<kFunction>(), kFunction, nullable);
   }
 
   /// Calls work() and counts what it throws, if it does, and after a report the last error.
@@ -118,18 +137,18 @@ class Area {
   }
 
   void AddWord(uint64_t word) {
-    digest_ = (digest_ ^ word) * 0x9E3779B97F4A7C15;
-    digest_ ^= digest_ >> 29;
+    uint64_t& digest = digests_.back().second;
+    digest = (digest ^ word) * 0x9E3779B97F4A7C15;
+    digest ^= digest >> 29;
   }
 
-  uint64_t digest_ = 0x6D;
+  Digests digests_;
   bool hasReported_ = false;
-  Operands operands_;
+  Operands operands_{0};
 };
 
-/// An area's name, its calls, and what it depends on.
+/// An area's calls, and what it depends on.
 struct AreaEntry {
-  const char* name;
   void (*run)(Area&);
   bool usesLibm;     ///< Results pass through the platform's sin, cos, asin, acos or atan2.
   bool isReentrant;  ///< May run in several threads at once.
@@ -139,7 +158,7 @@ extern const AreaEntry kAreas[];
 extern const size_t kAreaCount;
 
 /// Runs an area; what the library reports meanwhile in this thread counts, too.
-uint64_t DigestOf(const AreaEntry& entry);
+Digests DigestsOf(const AreaEntry& entry);
 
 void RunTables(Area& area);
 void RunIntegers(Area& area);

@@ -40,7 +40,8 @@ Vector2 InShape(Operands& operands, uint32_t shape) {
 constexpr uint32_t kShapes = 6;
 
 template <class Point>
-void Hulls(Area& area) {
+void Hulls(Area& area, const char* name) {
+  area.Begin(name);
   Operands& operands = area.operands();
   for (uint32_t i = 0; i < 600; ++i) {
     const uint32_t shape = i % kShapes;
@@ -64,7 +65,8 @@ void Hulls(Area& area) {
 }
 
 template <class Point>
-void Convexity(Area& area) {
+void Convexity(Area& area, const char* name) {
+  area.Begin(name);
   Operands& operands = area.operands();
   for (int i = 0; i < Area::kTimes; ++i) {
     std::vector<Point> points(operands.Below(7));
@@ -80,7 +82,8 @@ void Convexity(Area& area) {
 }
 
 template <class Point>
-void HitTests(Area& area) {
+void HitTests(Area& area, const char* name) {
+  area.Begin(name);
   Operands& operands = area.operands();
   for (uint32_t i = 0; i < Area::kTimes; ++i) {
     const uint32_t count = i % 50 == 0 ? 65 + operands.Below(200) : operands.Below(12);
@@ -98,6 +101,7 @@ void HitTests(Area& area) {
 }
 
 void Clipping(Area& area) {
+  area.Begin("M_PolyPolyClip2D");
   Operands& operands = area.operands();
   for (int i = 0; i < Area::kTimes; ++i) {
     std::vector<Vector4> clipper, subject, result;
@@ -146,6 +150,7 @@ void AddPoly(Area& area, const M_TransformPoly3D& poly) {
 }
 
 void Quads(Area& area) {
+  area.Begin("M_TransformPoly2D, M_TransformPoly3D");
   Operands& operands = area.operands();
   for (int i = 0; i < Area::kTimes; ++i) {
     operands.BeginCall();
@@ -187,50 +192,55 @@ void Quads(Area& area) {
 
 void RunLines(Area& area) {
   area.Call(
+      "M_GetPlaneEquation",
       +[](const Vector3* points, uint32_t count, M_PlaneEq* plane, Vector3* centroid) {
         return M_GetPlaneEquation(points, static_cast<int32_t>(count % 9 == 0 ? 0 : count % 4 + 1),
                                   plane, centroid);
       },
       0b1000);
-  area.Call(M_GetPlaneEquation2);
-  area.Call(M_RayIntersectPlane, 0b110000);
-  area.Call(M_PerpDistTo2DLine, 0b1000);
-  area.Call(M_Clip3DLine);
-  area.Call(M_ClipLine2Rect);
+  area.Call<M_GetPlaneEquation2>();
+  area.Call<M_RayIntersectPlane>(0b110000);
+  area.Call<M_PerpDistTo2DLine>(0b1000);
+  area.Call<M_Clip3DLine>();
+  area.Call<M_ClipLine2Rect>();
 }
 
 void RunPolygons(Area& area) {
-  HitTests<Vector2>(area);
-  HitTests<M_Vector2T<float>>(area);
-  area.Call(M_IsFloatPointInQuad);
-  area.Call(+[](const Vector2* poly, uint32_t count) {
-    return M_SignedPolygonArea2D(poly, static_cast<int32_t>(count % 5));
-  });
-  area.Call(M_IsQuadEdgeOn);
+  HitTests<Vector2>(area, "M_IsFloatPointInConcavePoly(Vector2)");
+  HitTests<M_Vector2T<float>>(area, "M_IsFloatPointInConcavePoly(floats)");
+  area.Call<M_IsFloatPointInQuad>();
+  area.Call(
+      "M_SignedPolygonArea2D", +[](const Vector2* poly, uint32_t count) {
+        return M_SignedPolygonArea2D(poly, static_cast<int32_t>(count % 5));
+      });
+  area.Call<M_IsQuadEdgeOn>();
   Clipping(area);
 }
 
 void RunHulls(Area& area) {
-  Hulls<Vector2>(area);
-  Hulls<Vector3>(area);
-  Hulls<Vector4>(area);
-  Hulls<qelcore::geom::PointT<float>>(area);
-  Convexity<Vector2>(area);
-  Convexity<Vector3>(area);
-  Convexity<Vector4>(area);
+  Hulls<Vector2>(area, "M_ComputeConvexHull(Vector2)");
+  Hulls<Vector3>(area, "M_ComputeConvexHull(Vector3)");
+  Hulls<Vector4>(area, "M_ComputeConvexHull(Vector4)");
+  Hulls<qelcore::geom::PointT<float>>(area, "M_ComputeConvexHull(PointT<float>)");
+  Convexity<Vector2>(area, "M_IsConvex(Vector2)");
+  Convexity<Vector3>(area, "M_IsConvex(Vector3)");
+  Convexity<Vector4>(area, "M_IsConvex(Vector4)");
 }
 
 void RunScreen(Area& area) {
   Quads(area);
-  area.Call(M_TransformPoint2DtoScreen);
-  area.Call(+[](const M_Matrix4& toEye, const M_Matrix4& projection, const M_Matrix3& toScreen,
-                Vector3* point) {
-    return M_TransformPoint3DtoScreen(toEye, projection, toScreen, point);
-  });
-  area.Call(+[](const M_Matrix4& toEye, const M_Matrix4& projection, const M_Matrix3& toScreen,
-                Vector2* point) {
-    return M_TransformPoint3DtoScreen(toEye, projection, toScreen, point);
-  });
+  area.Call<M_TransformPoint2DtoScreen>();
+  area.Call(
+      "M_TransformPoint3DtoScreen", +[](const M_Matrix4& toEye, const M_Matrix4& projection,
+                                        const M_Matrix3& toScreen, Vector3* point) {
+        return M_TransformPoint3DtoScreen(toEye, projection, toScreen, point);
+      });
+  area.Call(
+      "M_TransformPoint3DtoScreen of the plane",
+      +[](const M_Matrix4& toEye, const M_Matrix4& projection, const M_Matrix3& toScreen,
+          Vector2* point) {
+        return M_TransformPoint3DtoScreen(toEye, projection, toScreen, point);
+      });
 }
 
 }  // namespace digest

@@ -1,5 +1,5 @@
-// Prints a digest of the results of each area of the library, to see that a machine gives the bits
-// that others do.
+// Prints a digest of the results of each function of the library, to see that a machine gives the
+// bits that others do.
 
 #include <cstdio>
 #include <cstdlib>
@@ -14,13 +14,14 @@
 
 namespace {
 
-using digest::DigestOf;
+using digest::Digests;
+using digest::DigestsOf;
 using digest::kAreaCount;
 using digest::kAreas;
 
 constexpr const char* kUsage =
     "usage: digest [--threads N] [--compare FILE]\n"
-    "Prints a digest of what the functions of each area give for many operands.\n"
+    "Prints a digest of what each function gives for many operands.\n"
     "  --threads N     also runs what is reentrant in N threads at once and compares\n"
     "  --compare FILE  compares with digests that were printed before; what passes through the\n"
     "                  platform's sines may differ, nothing else\n";
@@ -31,7 +32,7 @@ std::string Hex(uint64_t value) {
   return text;
 }
 
-// The digests of a file, by area.
+// The digests of a file, by function.
 std::map<std::string, std::string> Read(const char* path) {
   std::map<std::string, std::string> digests;
   std::ifstream file(path);
@@ -43,7 +44,7 @@ std::map<std::string, std::string> Read(const char* path) {
 }
 
 // False if one of many threads sees something else than this one has.
-bool AreThreadsAlike(int count, const std::vector<uint64_t>& expected) {
+bool AreThreadsAlike(int count, const std::vector<Digests>& expected) {
   std::vector<int> differences(static_cast<size_t>(count), 0);
   std::vector<std::thread> threads;
   threads.reserve(differences.size());
@@ -52,7 +53,7 @@ bool AreThreadsAlike(int count, const std::vector<uint64_t>& expected) {
     threads.emplace_back([t, &differences, &expected] {
       for (size_t k = 0; k < kAreaCount; ++k) {
         const size_t i = (t * 5 + k) % kAreaCount;
-        if (kAreas[i].isReentrant) differences[t] += DigestOf(kAreas[i]) != expected[i];
+        if (kAreas[i].isReentrant) differences[t] += DigestsOf(kAreas[i]) != expected[i];
       }
     });
   }
@@ -63,10 +64,12 @@ bool AreThreadsAlike(int count, const std::vector<uint64_t>& expected) {
 }
 
 int Run(int threads, const char* file) {
-  std::vector<uint64_t> digests(kAreaCount);
+  std::vector<Digests> digests(kAreaCount);
   for (size_t i = 0; i < kAreaCount; ++i) {
-    digests[i] = DigestOf(kAreas[i]);
-    std::printf("%s %s\n", Hex(digests[i]).c_str(), kAreas[i].name);
+    digests[i] = DigestsOf(kAreas[i]);
+    for (const auto& [name, value] : digests[i]) {
+      std::printf("%s %s\n", Hex(value).c_str(), name.c_str());
+    }
   }
   int status = 0;
   if (threads > 0 && !AreThreadsAlike(threads, digests)) {
@@ -76,11 +79,13 @@ int Run(int threads, const char* file) {
   if (!file) return status;
   const auto expected = Read(file);
   for (size_t i = 0; i < kAreaCount; ++i) {
-    const auto line = expected.find(kAreas[i].name);
-    if (line != expected.end() && line->second == Hex(digests[i])) continue;
-    std::fprintf(stderr, "digest: %s differ%s\n", kAreas[i].name,
-                 kAreas[i].usesLibm ? ", as they may on another platform" : "");
-    if (!kAreas[i].usesLibm) status = 1;
+    for (const auto& [name, value] : digests[i]) {
+      const auto line = expected.find(name);
+      if (line != expected.end() && line->second == Hex(value)) continue;
+      std::fprintf(stderr, "digest: %s differs%s\n", name.c_str(),
+                   kAreas[i].usesLibm ? ", as it may on another platform" : "");
+      if (!kAreas[i].usesLibm) status = 1;
+    }
   }
   return status;
 }

@@ -7,9 +7,9 @@ namespace {
 
 // Decompositions of what has rows to decompose: random elements would do, but mostly without
 // mirrors, lock and failures.
-void Decompose(Area& area,
-               int32_t (*function)(const M_Matrix4*, M_Matrix4Decomp*, unsigned char*)) {
-  area.Call(function, 0b100);
+template <auto kFunction>
+void Decompose(Area& area) {
+  area.Call<kFunction>(0b100);
   for (int i = 0; i < Area::kTimes; ++i) {
     Operands& operands = area.operands();
     M_Matrix4 m = {};
@@ -21,7 +21,7 @@ void Decompose(Area& area,
     m.m[3][3] = 1;
     M_Matrix4Decomp parts = {};
     unsigned char hasFailed = 0;
-    area.Try([&] { area.Add(function(&m, &parts, operands.Below(2) ? &hasFailed : nullptr)); });
+    area.Try([&] { area.Add(kFunction(&m, &parts, operands.Below(2) ? &hasFailed : nullptr)); });
     area.Add(parts);
     area.Add(hasFailed);
     area.Add(M_Correct3DDecompFor2D(&parts));
@@ -37,23 +37,23 @@ void Decompose(Area& area,
 }  // namespace
 
 void RunRotations(Area& area) {
-  area.Call(M_RotateMatrix);
-  Decompose(area, M_DecomposeMatrix4);
-  Decompose(area, M_DecomposeMatrix4ZYX);
-  area.Call(M_Correct3DDecompFor2D);
-  area.Call(M_GetOrderedXYZRotationFromMatrix);
-  area.Call(M_RotateMatrix4);
-  area.Call(M_RotateMatrix4XYZ);
-  area.Call(M_RotateMatrix4XYZPlus);
-  area.Call(M_ConvertAxisAngleToOrderedXYZRotation);
-  area.Call(M_Slerp);
+  area.Call<M_RotateMatrix>();
+  Decompose<M_DecomposeMatrix4>(area);
+  Decompose<M_DecomposeMatrix4ZYX>(area);
+  area.Call<M_Correct3DDecompFor2D>();
+  area.Call<M_GetOrderedXYZRotationFromMatrix>();
+  area.Call<M_RotateMatrix4>();
+  area.Call<M_RotateMatrix4XYZ>();
+  area.Call<M_RotateMatrix4XYZPlus>();
+  area.Call<M_ConvertAxisAngleToOrderedXYZRotation>();
+  area.Call<M_Slerp>();
 }
 
 void RunBearings(Area& area) {
-  area.Call(M_PtToAngle);
-  area.Call(M_VecToAngle);
-  area.Call(M_Pt2Angle);
-  area.Call(M_TransformPtF);
+  area.Call<M_PtToAngle>();
+  area.Call<M_VecToAngle>();
+  area.Call<M_Pt2Angle>();
+  area.Call<M_TransformPtF>();
 }
 
 }  // namespace digest
