@@ -1,6 +1,6 @@
 #!/bin/sh
-# Installs the library, moves the installed tree, and uses it as others would: by CMake, by pkg-config
-# and for the example.
+# Installs the library, moves the installed tree, and uses it as others would: by CMake and by
+# pkg-config.
 # Usage: install.sh BUILD_FOLDER SOURCE_FOLDER COMPILER LIBDIR
 set -eu
 build=$1
@@ -46,9 +46,3 @@ expect "$plain" "$("$work/cmake/minimal")"
 "$compiler" $flags "$source/examples/minimal/main.cpp" $(pkg-config --cflags --libs --static M) \
   -Wl,-rpath,"$(pkg-config --variable=libdir M)" -o "$work/by_pkg_config"
 expect "$plain" "$("$work/by_pkg_config")"
-
-cmake -S "$source/examples/comp" -B "$work/comp" -DCMAKE_PREFIX_PATH="$work/moved" \
-  -DCMAKE_CXX_COMPILER="$compiler" >/dev/null
-cmake --build "$work/comp" >/dev/null
-expect "$("$build/bin/comp" "$source"/examples/comp/samples/*.json)" \
-  "$("$work/comp/comp" "$source"/examples/comp/samples/*.json)"

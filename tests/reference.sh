@@ -4,8 +4,12 @@
 set -eu
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
+flags='-std=c++17 -Wall -Wextra -Wpedantic -Werror'
+# What the headers need of the standard library is read once for all of them.
+printf '#include <%s>\n' cstddef cstdint exception iterator type_traits utility vector >"$work/std.h"
+"$3" $flags -x c++-header "$work/std.h" -o "$work/std.h.gch"
 for example in "$1"/examples/reference/*.cpp; do
-  "$3" -std=c++17 -Wall -Wextra -Wpedantic -Werror -isystem "$1/include" -isystem "$1/host/include" "$example" -o "$work/example" \
+  "$3" $flags -include "$work/std.h" -isystem "$1/include" -isystem "$1/host/include" "$example" -o "$work/example" \
     -L"$2" -Wl,-rpath,"$2" -lM -lMHost
   sed -nE 's/^.*;  +\/\/ -> (.*)$/\1/p' "$example" >"$work/expected"
   "$work/example" >"$work/printed" 2>/dev/null || { echo "$example fails"; exit 1; }
