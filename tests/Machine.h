@@ -110,4 +110,21 @@ Function Describe(Result (*)(Parameters...), const CallOptions& options) {
   return f;
 }
 
+/// Of a member, by its object's address.
+template <auto kMember, class Object, class... Parameters>
+void CallMember(Object* object, Parameters... parameters) {
+  (object->*kMember)(parameters...);
+}
+template <auto kMember, class Class, class... Parameters>
+Function Describe(void (Class::*)(Parameters...), CallOptions options) {
+  options.inOut |= 1;
+  constexpr auto kCall = CallMember<kMember, Class, Parameters...>;
+  return Describe<kCall>(kCall, options);
+}
+template <auto kMember, class Class, class... Parameters>
+Function Describe(void (Class::*)(Parameters...) const, const CallOptions& options) {
+  constexpr auto kCall = CallMember<kMember, const Class, Parameters...>;
+  return Describe<kCall>(kCall, options);
+}
+
 #endif  // TESTS_MACHINE_H

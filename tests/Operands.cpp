@@ -22,31 +22,11 @@ Gen<T> Of() {
   } else if constexpr (std::is_same_v<T, M_Ratio>) {
     const auto den = gen::map(Words(), [](uint32_t w) { return w ? w : 1; });
     return gen::oneOf(Make<T>(Of<int32_t>(), den), Make<T>(Ints(), gen::inRange<uint32_t>(1, 10)));
-  } else if constexpr (std::is_same_v<T, M_WHRect>) {
-    return gen::map(gen::container<std::array<int16_t, 4>>(Of<int16_t>()), [](const auto& v) {
-      return M_WHRect{{v[0], v[1], v[2], v[3]}};
-    });
-  } else if constexpr (requires(T t) { t.right; }) {
-    using E = decltype(T::left);
-    return Make<T>(Of<E>(), Of<E>(), Of<E>(), Of<E>());
-  } else if constexpr (requires(T t) { t.h; }) {
-    return Make<T>(Of<decltype(T::h)>(), Of<decltype(T::h)>());
   } else if constexpr (requires(T t) { t.value; }) {
     return Make<T>(Of<decltype(T::value)>());
-  } else if constexpr (requires(T t) { t.w; }) {
-    return Make<T>(Of<double>(), Of<double>(), Of<double>(), Of<double>());
-  } else if constexpr (requires(T t) { t.z; }) {
-    return Make<T>(Of<double>(), Of<double>(), Of<double>());
-  } else if constexpr (requires(T t) { t.y; }) {
-    return Make<T>(Of<decltype(T::x)>(), Of<decltype(T::x)>());
-  } else if constexpr (std::is_same_v<T, M_PlaneEq>) {
-    return Make<T>(Of<double>(), Of<double>(), Of<double>(), Of<double>());
-  } else if constexpr (std::is_same_v<T, M_Ray>) {
-    return Make<T>(Of<V4>(), Of<V4>());
   } else {
-    return gen::map(gen::container<std::array<V3, 4>>(Of<V3>()), [](const auto& v) {
-      return M_Matrix4Decomp{v[0], v[1], {v[2].x, v[2].y, v[2].z}, v[3]};
-    });
+    return gen::map(gen::container<NumbersOf<T>>(Of<NumberOf<T>>()),
+                    [](const NumbersOf<T>& numbers) { return std::bit_cast<T>(numbers); });
   }
 }
 

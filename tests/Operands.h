@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <array>
+#include <bit>
 #include <charconv>
 #include <cmath>
 #include <limits>
@@ -88,36 +89,25 @@ inline void showValue(const Digit& i, std::ostream& os) { os << i.value; }
 inline void showValue(const Any& d, std::ostream& os) { showValue(d.value, os); }
 inline void showValue(const Real& d, std::ostream& os) { showValue(d.value, os); }
 inline void showValue(const M_Ratio& r, std::ostream& os) { ShowList(os, r.num, r.den); }
-inline void showValue(const M_Point& p, std::ostream& os) { ShowList(os, p.v, p.h); }
-inline void showValue(const M_LPoint& p, std::ostream& os) { ShowList(os, p.h, p.v); }
-inline void showValue(const M_FixedPoint& p, std::ostream& os) { ShowList(os, p.h, p.v); }
-inline void showValue(const M_Rect& r, std::ostream& os) {
-  ShowList(os, r.top, r.left, r.bottom, r.right);
-}
-inline void showValue(const M_WHRect& r, std::ostream& os) {
-  ShowList(os, r.values[0], r.values[1], r.values[2], r.values[3]);
-}
-template <class Rect>
-requires requires(Rect r) { r.right; }
-void showValue(const Rect& r, std::ostream& os) { ShowList(os, r.left, r.top, r.right, r.bottom); }
+
+/// A record of numbers of one type, whatever their names.
 template <class T>
-void showValue(const M_Vector2T<T>& v, std::ostream& os) {
-  ShowList(os, v.x, v.y);
+concept Record = std::is_aggregate_v<T> && std::is_trivially_copyable_v<T> && !requires(T t) {
+  t.begin();
 }
-inline void showValue(const V3& v, std::ostream& os) { ShowList(os, v.x, v.y, v.z); }
-inline void showValue(const V4& v, std::ostream& os) { ShowList(os, v.x, v.y, v.z, v.w); }
-inline void showValue(const M_PlaneEq& p, std::ostream& os) { ShowList(os, p.a, p.b, p.c, p.d); }
-inline void showValue(const M_Ray& r, std::ostream& os) { ShowList(os, r.origin, r.direction); }
-inline void showValue(const M_Matrix4Decomp& d, std::ostream& os) {
-  ShowList(os, d.translate, d.scale, V3{d.shear.xy, d.shear.xz, d.shear.yz}, d.rotate);
-}
-inline void showValue(const M_Matrix3& m, std::ostream& os) {
-  const auto row = [&](int i) { return V3{m.m[i][0], m.m[i][1], m.m[i][2]}; };
-  ShowList(os, row(0), row(1), row(2));
-}
-inline void showValue(const M_Matrix4& m, std::ostream& os) {
-  const auto row = [&](int i) { return V4{m.m[i][0], m.m[i][1], m.m[i][2], m.m[i][3]}; };
-  ShowList(os, row(0), row(1), row(2), row(3));
+&&!requires(T t) { t.value; };
+template <Record T>
+using NumberOf = std::conditional_t<
+    alignof(T) == alignof(int16_t), int16_t,
+    std::conditional_t<std::is_same_v<T, F2>, float,
+                       std::conditional_t<alignof(T) == alignof(int32_t), int32_t, double>>>;
+template <Record T>
+using NumbersOf = std::array<NumberOf<T>, sizeof(T) / sizeof(NumberOf<T>)>;
+
+template <Record T>
+void showValue(const T& record, std::ostream& os) {
+  std::apply([&](const auto&... numbers) { ShowList(os, numbers...); },
+             std::bit_cast<NumbersOf<T>>(record));
 }
 
 namespace operands {

@@ -11,31 +11,12 @@
 
 namespace {
 
-// Members, by a pointer or a reference to their object.
 using M3 = M_Matrix3;
 using M4 = M_Matrix4;
-constexpr auto kNormalize = +[](V4* v) { v->Normalize(); };
-constexpr auto kDivide3 = +[](const M3* m, V3* p) { m->TransformPointAndDivide(p); };
-constexpr auto kDivideAll3 =
-    +[](const M3* m, int32_t n, V3* p) { m->TransformPointsAndDivide(n, p); };
-constexpr auto kDivideFast3 = +[](const M3* m, V3* p) { m->TransformPointAndDivideFast(p); };
-constexpr auto kDivideAllFast3 =
-    +[](const M3* m, int32_t n, V3* p) { m->TransformPointsAndDivideFast(n, p); };
-constexpr auto kDivide4 = +[](const M4* m, V4* p) { m->TransformPointAndDivide(p); };
-constexpr auto kDivideAll4 =
-    +[](const M4* m, int32_t n, V4* p) { m->TransformPointsAndDivide(n, p); };
-constexpr auto kDivideFast4 = +[](const M4* m, V4* p) { m->TransformPointAndDivideFast(p); };
-constexpr auto kDivideAllFast4 =
-    +[](const M4* m, int32_t n, V4* p) { m->TransformPointsAndDivideFast(n, p); };
-constexpr auto kAdjoint = +[](M3* m) { m->Adjoint(); };
-constexpr auto kTranspose3 = +[](M3* m) { m->Transpose(); };
-constexpr auto kTranspose4 = +[](M4* m) { m->Transpose(); };
-constexpr auto kProject = +[](M4* m, double d) { m->Project(d); };
 constexpr auto kAdd3 = +[](M3* a, const M3& b) { *a += b; };
 constexpr auto kAdd4 = +[](M4* a, const M4& b) { *a += b; };
 constexpr auto kSubtract3 = +[](M3* a, const M3& b) { *a -= b; };
 constexpr auto kSubtract4 = +[](M4* a, const M4& b) { *a -= b; };
-constexpr auto kDropZ = +[](M3* m, const M4& from) { m->AssignFromByDroppingZ(from); };
 constexpr bool (*kEqualWithin3)(const M3&, const M3&, double) = M_EqualMatrixWithinEpsilon;
 constexpr bool (*kEqualWithin4)(const M4&, const M4&, double) = M_EqualMatrixWithinEpsilon;
 constexpr bool (*kToScreen3)(const M4&, const M4&, const M3&, V3*) = M_TransformPoint3DtoScreen;
@@ -46,27 +27,67 @@ constexpr auto kQuad = +[](const V2* p, const V2* quad, unsigned char* inside) {
   return M_IsFloatPointInQuad(p, quad, inside);
 };
 
-template <auto kFunction>
-Function F(const CallOptions& options = {}) {
-  return Describe<kFunction>(kFunction, options);
+template <auto... kFunctions>
+void Add(std::vector<Function>* all, const CallOptions& options = {}) {
+  (all->push_back(Describe<kFunctions>(kFunctions, options)), ...);
 }
-template <auto kFunction>
-Function InOut() {
-  return F<kFunction>({.inOut = 1});
+
+std::vector<Function> All() {
+  std::vector<Function> all;
+  Add<M_FixMul, M_FixDiv, M_Fix24Mul, M_Fix24Ratio, M_LeadingZeros, M_TrailingZeros,
+      M_RoundUpToPowerOf2, M_RoundDownToPowerOf2, M_BitsUsed, M_IsTopTwoBitsSame,
+      M_AddWouldOverflow, M_MulWouldOverflow, M_UMulWouldOverflow, M_SignedGCD, M_UnsignedGCD,
+      M_SignedLCM, M_UnsignedLCM, M_RoundDouble, M_RoundDoubleSafe, M_RoundDouble64, M_fmod,
+      M_CompareRatio, M_MinRatio, M_MaxRatio, M_ShortConvRatio, M_ClipRatioToSpan, M_ClipSpanToSpan,
+      Mp_Double2RatioSmart, M_SetPt, M_SetLPt, M_SetFixedPt, M_CopyPt, M_CopyLPt, M_CopyFixedPt,
+      M_EqualPt, M_EqualLPt, M_EqualFixedPt, M_DeltaPoint, M_SetRect, M_SetLRect, M_SetFixedRect,
+      M_SetWHRect, M_CopyRect, M_CopyLRect, M_CopyFixedRect, M_CopyWHRect, M_EqualRect,
+      M_EqualLRect, M_EqualFixedRect, M_EqualWHRect, M_EmptyRect, M_EmptyLRect, M_EmptyFixedRect,
+      M_PtInRect, M_LPtInRect, M_FixedPtInRect, M_Pt2Rect, M_LPt2Rect, M_FixedPt2Rect, M_PtToAngle,
+      M_RectCompare, M_LRectCompare, M_FixedRectCompare, M_FixedRect2Rect, M_FixedRect2LRect,
+      M_FixedRect2RectIn, M_FixedRect2LRectIn, M_FixedRect2RectOut, M_FixedRect2LRectOut,
+      M_Rect2FixedRect, M_LRect2FixedRect, M_TransformBounds, &V4::Normalize, &M3::Adjoint,
+      &M3::Transpose, &M4::Transpose, &M4::Project, kEqualWithin3, kEqualWithin4, M_EqualMatrix,
+      M_SetIdentityMatrix, M_GetMatrixType, M_InverseMatrix, M_EqualMatrix4, M_ZeroMatrix4,
+      M_IdentityMatrix4, M_SetMatrix4CoB, M_ConcatMatrix4, M_TransposeMatrix4,
+      M_GetMatrix4Determinant, M_InverseMatrix4, M_CalcNormalMatrix4, M_Matrix3ToMatrix4,
+      M_Matrix3ToMatrix4Uniform, M_GetOrderedXYZRotationFromMatrix,
+      M_ConvertAxisAngleToOrderedXYZRotation, M_LookAtMatrix, M_GetPlaneEquation2, M_Clip3DLine,
+      M_ComputeDirectionalComponents, M_VecToAngle, M_Pt2Angle, &M3::AssignFromByDroppingZ>(&all);
+  Add<M_ReduceRatio, M_RecipRatio, M_SectRect, M_SectLRect, M_SectFixedRect, M_SectFloatRect,
+      M_InverseMatrixQuiet, M_InverseMatrix4Quiet, M_CalcNormalMatrix4Quiet>(&all, {.nullable = 4});
+  Add<M_AddRatio, M_SubRatio, M_MulRatio, M_DivRatio, kToScreen3, kToScreen2>(&all, {.inOut = 8});
+  Add<M_FpLong2Ratio>(&all, {.nullable = 2});
+  Add<M_ConvRatio>(&all, {.nullable = 8, .isKept = true});
+  Add<M_ClipRatio, M_LRect2Rect, M_DecomposeMatrix4, M_DecomposeMatrix4ZYX>(&all, {.isKept = true});
+  Add<M_AddPt, M_CenterRect, M_CenterLRect, M_CenterFixedRect, &M3::TransformPointAndDivide,
+      &M3::TransformPointAndDivideFast, &M4::TransformPointAndDivide,
+      &M4::TransformPointAndDivideFast, M_ConcatMatrix, M_RotateMatrix4XYZPlus>(&all, {.inOut = 2});
+  Add<M_InsetRect, M_InsetLRect, M_InsetFixedRect, M_OffsetRect, M_OffsetLRect, M_OffsetFixedRect,
+      kAdd3, kAdd4, kSubtract3, kSubtract4, M_TranslateMatrix, M_RotateMatrix, M_ScaleMatrix,
+      M_TranslateMatrix4, M_ScaleMatrix4, M_Correct3DDecompFor2D, M_RotateMatrix4,
+      M_RotateMatrix4XYZ>(&all, {.inOut = 1});
+  Add<M_TransformFloatPoints, M_TransformPoints, M_TransformFixPoints, M_TransformVector3,
+      M_TransformVector4NoDivide, M_TransformVector4, M_Transform3DFloatPoints,
+      M_3DTransform2DPoints, &M3::TransformPointsAndDivide, &M3::TransformPointsAndDivideFast,
+      &M4::TransformPointsAndDivide, &M4::TransformPointsAndDivideFast>(
+      &all, {.inOut = 4, .count = 1, .many = 4});
+  Add<M_TransformRect, M_TransformFloatRect>(&all, {.inOut = 2, .nullable = 12, .many = 4});
+  Add<M_TransformFixRect>(&all, {.inOut = 2, .nullable = 12, .isKept = true, .many = 4});
+  Add<M_QuatToMatrix4>(&all, {.many = 1});
+  Add<M_Matrix4ToQuat, kQuad, M_IsQuadEdgeOn>(&all, {.many = 2});
+  Add<M_Slerp>(&all, {.many = 7});
+  Add<M_GetPlaneEquation>(&all, {.nullable = 8, .count = 1, .many = 1});
+  Add<M_RayIntersectPlane>(&all, {.nullable = 16});
+  Add<M_PerpDistTo2DLine>(&all, {.nullable = 8});
+  Add<M_ClipLine2Rect>(&all, {.inOut = 6});
+  Add<M_TransformPtF, M_TransformPoint2DtoScreen>(&all, {.inOut = 4});
+  Add<M_SignedPolygonArea2D>(&all, {.count = 1, .many = 1});
+  Add<kInPoly, kInPolyF>(&all, {.count = 2, .many = 2});
+  return all;
 }
-template <auto kFunction>
-Function InOut2() {
-  return F<kFunction>({.inOut = 2});
-}
-template <auto kFunction>
-Function Batch() {
-  return F<kFunction>({.inOut = 4, .count = 1, .many = 4});
-}
-// The status byte is permission and outcome.
-template <auto kFunction>
-Function Sum() {
-  return F<kFunction>({.inOut = 8});
-}
+
+const std::vector<Function> kAll = All();
 
 void Expect(bool holds, const Function& f, const Function::Values& given, const std::string& what) {
   if (!holds) RC_FAIL(f.Text(given) + ": " + what);
@@ -149,189 +170,6 @@ void TestOutputs(const Function& f) {
            "output " + std::to_string(k) + " alone");
   }
 }
-
-const Function kAll[] = {
-    F<M_FixMul>(),
-    F<M_FixDiv>(),
-    F<M_Fix24Mul>(),
-    F<M_Fix24Ratio>(),
-    F<M_LeadingZeros>(),
-    F<M_TrailingZeros>(),
-    F<M_RoundUpToPowerOf2>(),
-    F<M_RoundDownToPowerOf2>(),
-    F<M_BitsUsed>(),
-    F<M_IsTopTwoBitsSame>(),
-    F<M_AddWouldOverflow>(),
-    F<M_MulWouldOverflow>(),
-    F<M_UMulWouldOverflow>(),
-    F<M_SignedGCD>(),
-    F<M_UnsignedGCD>(),
-    F<M_SignedLCM>(),
-    F<M_UnsignedLCM>(),
-    F<M_RoundDouble>(),
-    F<M_RoundDoubleSafe>(),
-    F<M_RoundDouble64>(),
-    F<M_fmod>(),
-    F<M_ReduceRatio>({.nullable = 4}),
-    Sum<M_AddRatio>(),
-    Sum<M_SubRatio>(),
-    Sum<M_MulRatio>(),
-    Sum<M_DivRatio>(),
-    F<M_RecipRatio>({.nullable = 4}),
-    F<M_CompareRatio>(),
-    F<M_MinRatio>(),
-    F<M_MaxRatio>(),
-    F<M_FpLong2Ratio>({.nullable = 2}),
-    F<M_ConvRatio>({.nullable = 8, .isKept = true}),
-    F<M_ShortConvRatio>(),
-    F<M_ClipRatio>({.isKept = true}),
-    F<M_ClipRatioToSpan>(),
-    F<M_ClipSpanToSpan>(),
-    F<Mp_Double2RatioSmart>(),
-    F<M_SetPt>(),
-    F<M_SetLPt>(),
-    F<M_SetFixedPt>(),
-    F<M_CopyPt>(),
-    F<M_CopyLPt>(),
-    F<M_CopyFixedPt>(),
-    F<M_EqualPt>(),
-    F<M_EqualLPt>(),
-    F<M_EqualFixedPt>(),
-    InOut2<M_AddPt>(),
-    F<M_DeltaPoint>(),
-    F<M_SetRect>(),
-    F<M_SetLRect>(),
-    F<M_SetFixedRect>(),
-    F<M_SetWHRect>(),
-    F<M_CopyRect>(),
-    F<M_CopyLRect>(),
-    F<M_CopyFixedRect>(),
-    F<M_CopyWHRect>(),
-    F<M_EqualRect>(),
-    F<M_EqualLRect>(),
-    F<M_EqualFixedRect>(),
-    F<M_EqualWHRect>(),
-    F<M_EmptyRect>(),
-    F<M_EmptyLRect>(),
-    F<M_EmptyFixedRect>(),
-    InOut<M_InsetRect>(),
-    InOut<M_InsetLRect>(),
-    InOut<M_InsetFixedRect>(),
-    InOut<M_OffsetRect>(),
-    InOut<M_OffsetLRect>(),
-    InOut<M_OffsetFixedRect>(),
-    InOut2<M_CenterRect>(),
-    InOut2<M_CenterLRect>(),
-    InOut2<M_CenterFixedRect>(),
-    F<M_PtInRect>(),
-    F<M_LPtInRect>(),
-    F<M_FixedPtInRect>(),
-    F<M_Pt2Rect>(),
-    F<M_LPt2Rect>(),
-    F<M_FixedPt2Rect>(),
-    F<M_PtToAngle>(),
-    F<M_SectRect>({.nullable = 4}),
-    F<M_SectLRect>({.nullable = 4}),
-    F<M_SectFixedRect>({.nullable = 4}),
-    F<M_SectFloatRect>({.nullable = 4}),
-    F<M_RectCompare>(),
-    F<M_LRectCompare>(),
-    F<M_FixedRectCompare>(),
-    F<M_FixedRect2Rect>(),
-    F<M_FixedRect2LRect>(),
-    F<M_FixedRect2RectIn>(),
-    F<M_FixedRect2LRectIn>(),
-    F<M_FixedRect2RectOut>(),
-    F<M_FixedRect2LRectOut>(),
-    F<M_Rect2FixedRect>(),
-    F<M_LRect2FixedRect>(),
-    F<M_LRect2Rect>({.isKept = true}),
-    Batch<M_TransformFloatPoints>(),
-    Batch<M_TransformPoints>(),
-    Batch<M_TransformFixPoints>(),
-    Batch<M_TransformVector3>(),
-    Batch<M_TransformVector4NoDivide>(),
-    Batch<M_TransformVector4>(),
-    Batch<M_Transform3DFloatPoints>(),
-    Batch<M_3DTransform2DPoints>(),
-    F<M_TransformRect>({.inOut = 2, .nullable = 12, .many = 4}),
-    F<M_TransformFloatRect>({.inOut = 2, .nullable = 12, .many = 4}),
-    F<M_TransformFixRect>({.inOut = 2, .nullable = 12, .isKept = true, .many = 4}),
-    F<M_TransformBounds>(),
-    InOut<kNormalize>(),
-    F<kDivide3>({.inOut = 2}),
-    Batch<kDivideAll3>(),
-    F<kDivideFast3>({.inOut = 2}),
-    Batch<kDivideAllFast3>(),
-    F<kDivide4>({.inOut = 2}),
-    Batch<kDivideAll4>(),
-    F<kDivideFast4>({.inOut = 2}),
-    Batch<kDivideAllFast4>(),
-    InOut<kAdjoint>(),
-    InOut<kTranspose3>(),
-    InOut<kTranspose4>(),
-    InOut<kProject>(),
-    InOut<kAdd3>(),
-    InOut<kAdd4>(),
-    InOut<kSubtract3>(),
-    InOut<kSubtract4>(),
-    F<kDropZ>(),
-    F<kEqualWithin3>(),
-    F<kEqualWithin4>(),
-    F<M_EqualMatrix>(),
-    F<M_SetIdentityMatrix>(),
-    InOut<M_TranslateMatrix>(),
-    InOut<M_RotateMatrix>(),
-    InOut<M_ScaleMatrix>(),
-    InOut2<M_ConcatMatrix>(),
-    F<M_GetMatrixType>(),
-    F<M_InverseMatrixQuiet>({.nullable = 4}),
-    F<M_InverseMatrix>(),
-    F<M_EqualMatrix4>(),
-    F<M_ZeroMatrix4>(),
-    F<M_IdentityMatrix4>(),
-    F<M_SetMatrix4CoB>(),
-    F<M_ConcatMatrix4>(),
-    F<M_TransposeMatrix4>(),
-    F<M_GetMatrix4Determinant>(),
-    F<M_InverseMatrix4Quiet>({.nullable = 4}),
-    F<M_InverseMatrix4>(),
-    F<M_CalcNormalMatrix4Quiet>({.nullable = 4}),
-    F<M_CalcNormalMatrix4>(),
-    InOut<M_TranslateMatrix4>(),
-    InOut<M_ScaleMatrix4>(),
-    F<M_Matrix3ToMatrix4>(),
-    F<M_Matrix3ToMatrix4Uniform>(),
-    F<M_DecomposeMatrix4>({.isKept = true}),
-    F<M_DecomposeMatrix4ZYX>({.isKept = true}),
-    F<M_GetOrderedXYZRotationFromMatrix>(),
-    InOut<M_Correct3DDecompFor2D>(),
-    InOut<M_RotateMatrix4>(),
-    InOut<M_RotateMatrix4XYZ>(),
-    F<M_RotateMatrix4XYZPlus>({.inOut = 2}),
-    F<M_ConvertAxisAngleToOrderedXYZRotation>(),
-    F<M_LookAtMatrix>(),
-    F<M_QuatToMatrix4>({.many = 1}),
-    F<M_Matrix4ToQuat>({.many = 2}),
-    F<M_Slerp>({.many = 7}),
-    F<M_GetPlaneEquation>({.nullable = 8, .count = 1, .many = 1}),
-    F<M_GetPlaneEquation2>(),
-    F<M_RayIntersectPlane>({.nullable = 16}),
-    F<M_PerpDistTo2DLine>({.nullable = 8}),
-    F<M_Clip3DLine>(),
-    F<M_ClipLine2Rect>({.inOut = 6}),
-    F<M_ComputeDirectionalComponents>(),
-    F<M_VecToAngle>(),
-    F<M_Pt2Angle>(),
-    F<M_TransformPtF>({.inOut = 4}),
-    F<kQuad>({.many = 2}),
-    F<M_SignedPolygonArea2D>({.count = 1, .many = 1}),
-    F<M_IsQuadEdgeOn>({.many = 2}),
-    F<kInPoly>({.count = 2, .many = 2}),
-    F<kInPolyF>({.count = 2, .many = 2}),
-    F<M_TransformPoint2DtoScreen>({.inOut = 4}),
-    F<kToScreen3>({.inOut = 8}),
-    F<kToScreen2>({.inOut = 8})};
 
 TEST(Calls, OutputsMayStandInInputs) {
   for (const Function& f : kAll) Holds([&] { TestPlaces(f); }, 0.05);
