@@ -149,25 +149,56 @@ void RatioArithmetic() {
 #endif
   );
 
-  Line("compare", "M", times, [](const auto& p) {
+  // Sound and transport clocks, beyond what 15 bits hold, and operands of all 31 bits.
+  static const auto clocks = Generate<std::pair<M_Ratio, M_Ratio>>([] {
+    static constexpr uint32_t kClocks[] = {44100, 48000, 88200, 90000, 96000, 192000};
+    const auto time = [] {
+      return M_Ratio{static_cast<int32_t>(Random() >> 13) + 1, kClocks[Random() % 6]};
+    };
+    return std::pair(time(), time());
+  });
+  static const auto wide = Generate<std::pair<M_Ratio, M_Ratio>>([] {
+    const auto any = [] { return M_Ratio{static_cast<int32_t>(Random() >> 1), Random() / 2 + 1}; };
+    return std::pair(any(), any());
+  });
+  const auto add = [](const auto& p) {
+    M_Ratio sum;
+    M_AddRatio(&p.first, &p.second, &sum, nullptr);
+    return sum;
+  };
+  const auto compare = [](const auto& p) {
     int32_t order;
     M_CompareRatio(&p.first, &p.second, &order);
     return order;
-  });
+  };
+  Line("add, clocks", "M", clocks, add);
+  Line("compare", "M", times, compare);
+  Line("compare, clocks", "M", clocks, compare);
+  Line("compare, wide", "M", wide, compare);
   Line("minimum", "M", times, [](const auto& p) {
     M_Ratio smaller;
     M_MinRatio(&p.first, &p.second, &smaller);
     return smaller;
   });
 #ifdef BENCH_HAS_BOOST
-  static const auto boostTimes = ToBoost(times);
-  Line("compare", "Boost", boostTimes, [](const auto& p) { return p.first < p.second; });
+  static const auto boostTimes = ToBoost(times), boostClocks = ToBoost(clocks),
+                    boostWide = ToBoost(wide);
+  const auto isLess = [](const auto& p) { return p.first < p.second; };
+  Line("add, clocks", "Boost", boostClocks, [](const auto& p) { return p.first + p.second; });
+  Line("compare", "Boost", boostTimes, isLess);
+  Line("compare, clocks", "Boost", boostClocks, isLess);
+  Line("compare, wide", "Boost", boostWide, isLess);
   Line("minimum", "Boost", boostTimes,
        [](const auto& p) { return p.first < p.second ? p.first : p.second; });
 #endif
 #ifdef BENCH_HAS_AVUTIL
-  static const auto avTimes = ToAv(times);
-  Line("compare", "libavutil", avTimes, [](const auto& p) { return av_cmp_q(p.first, p.second); });
+  static const auto avTimes = ToAv(times), avClocks = ToAv(clocks), avWide = ToAv(wide);
+  const auto order = [](const auto& p) { return av_cmp_q(p.first, p.second); };
+  Line("add, clocks", "libavutil", avClocks,
+       [](const auto& p) { return av_add_q(p.first, p.second); });
+  Line("compare", "libavutil", avTimes, order);
+  Line("compare, clocks", "libavutil", avClocks, order);
+  Line("compare, wide", "libavutil", avWide, order);
   Line("minimum", "libavutil", avTimes,
        [](const auto& p) { return av_cmp_q(p.first, p.second) < 0 ? p.first : p.second; });
 #endif
@@ -178,11 +209,25 @@ void RatioArithmetic() {
     const auto samples = [] { return static_cast<int32_t>(Random() % 20000 + 1) * 1024; };
     return std::pair(M_Ratio{samples(), 96000 * 1024}, M_Ratio{samples(), 44100 * 1024});
   });
-  Line("add, overflowing", "M", large, [](const auto& p) {
-    M_Ratio sum;
-    M_AddRatio(&p.first, &p.second, &sum, nullptr);
-    return sum;
+  Line("add, reducing", "M", large, add);
+  Line("multiply, reducing", "M", large, [](const auto& p) {
+    M_Ratio product;
+    unsigned char status = 0;
+    M_MulRatio(&p.first, &p.second, &product, &status);
+    return product;
   });
+#ifdef BENCH_HAS_BOOST
+  static const auto boostLarge = ToBoost(large);
+  Line("add, reducing", "Boost", boostLarge, [](const auto& p) { return p.first + p.second; });
+  Line("multiply, reducing", "Boost", boostLarge, [](const auto& p) { return p.first * p.second; });
+#endif
+#ifdef BENCH_HAS_AVUTIL
+  static const auto avLarge = ToAv(large);
+  Line("add, reducing", "libavutil", avLarge,
+       [](const auto& p) { return av_add_q(p.first, p.second); });
+  Line("multiply, reducing", "libavutil", avLarge,
+       [](const auto& p) { return av_mul_q(p.first, p.second); });
+#endif
 
   static const auto unreduced = Generate<M_Ratio>([] {
     const M_Ratio time = FrameTime();
@@ -225,7 +270,12 @@ void Approximation() {
 // otherwise than M_FixMul and M_FixDiv, so this compares times only.
 void FixedPoint() {
   static const auto values = Generate<std::pair<M_Fixed, M_Fixed>>([] {
-    const auto value = [] { return static_cast<M_Fixed>(Random() % 0x1000000 + 0x100); };
+    // Of either sign, a quarter of them whole.
+    const auto value = [] {
+      const auto magnitude = static_cast<M_Fixed>(Random() % 0x1000000 + 0x100);
+      const M_Fixed any = Random() % 4 == 0 ? magnitude & ~0xFFFF : magnitude;
+      return Random() % 2 == 0 ? any | 0x10000 : -(any | 0x10000);
+    };
     return std::pair(value(), value());
   });
   Line("16.16 multiply", "M", values, [](const auto& p) { return M_FixMul(p.first, p.second); });

@@ -122,15 +122,16 @@ void Operations(const std::string& what, const std::vector<const bench::Peers*>&
                 const std::vector<Operand>& a, const std::vector<Operand>& b, Work work) {
   const auto as = std::make_shared<std::vector<Operand>>(a);
   const auto bs = std::make_shared<std::vector<Operand>>(b);
-  const auto out = std::make_shared<std::vector<Out>>(kOperands);
-  Batch(what, "M", kOperands, [=] {
-    for (size_t i = 0; i < kOperands; ++i) work((*as)[i], (*bs)[i], (*out)[i]);
+  const auto out = std::make_shared<std::vector<Out>>(a.size());
+  const int count = static_cast<int>(a.size());
+  Batch(what, "M", count, [=] {
+    for (size_t i = 0; i < as->size(); ++i) work((*as)[i], (*bs)[i], (*out)[i]);
   });
   for (size_t build = 0; build < peers.size(); ++build) {
     for (const auto& peer : peers[build]->operations) {
       if (peer.what != what) continue;
-      Batch(what, Subject(peer.peer, build), kOperands,
-            [=] { peer.run(kOperands, as->data(), bs->data(), out->data()); });
+      Batch(what, Subject(peer.peer, build), count,
+            [=] { peer.run(count, as->data(), bs->data(), out->data()); });
     }
   }
 }
@@ -148,7 +149,7 @@ std::vector<Matrix> RandomMatrices() {
 
 template <class Rect, class Edge>
 std::vector<Rect> RandomRects(Edge size) {
-  std::vector<Rect> all(kOperands);
+  std::vector<Rect> all(4096);  // More than what a processor learns by heart.
   for (Rect& r : all) {
     const auto edge = [&] { return static_cast<Edge>(Uniform(0, static_cast<double>(size))); };
     r.left = edge(), r.top = edge();

@@ -7,6 +7,7 @@
 #include "Mp_Matrix.h"
 #include "Mp_Strs.h"
 #include "Mp_Tolerance.h"
+#include "Mp_Vector3.h"
 #include "U.h"
 
 namespace {
@@ -119,7 +120,10 @@ bool M_Matrix3::IsIdentityWithinEpsilon(double eps) const {
   return Mp::IsEqualWithin(*this, Mp::kIdentity3, eps);
 }
 
-double M_Matrix3::Determinant() const { return Mp::Determinant(m[0], m[1], m[2], 0, 1, 2); }
+double M_Matrix3::Determinant() const {
+  const auto row = [this](int i) { return M_Vector3T<double>{m[i][0], m[i][1], m[i][2]}; };
+  return Mp::Dot(row(0), Mp::Cross(row(1), row(2)));
+}
 
 void M_Matrix3::Adjoint() {
   const auto& a = m;

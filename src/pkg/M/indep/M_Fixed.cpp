@@ -1,4 +1,7 @@
 #include "M_Utils.h"
+
+#include <bit>
+
 #include "Mp_Arith.h"
 #include "Mp_Bits.h"
 #include "Mp_Err.h"
@@ -17,50 +20,38 @@ M_Fix24 ToFix24(double value) {
   return Mp::TruncTo<int32_t>(value * kFix24One + (value >= 0 ? 0.5 : -0.5));
 }
 
-// A 16.16 result of the wrong sign has overflowed; 0 goes with either sign.
-M_Fixed CheckSign(int32_t a, int32_t b, int32_t result) {
-  const bool isWrong = (a ^ b) >= 0 ? result < 0 : result > 0;
-  return isWrong ? kError : result;
-}
+// All ones where one of the two is negative and the other is not, else 0.
+int32_t SignMask(int32_t a, int32_t b) { return (a ^ b) >> 31; }
+
+// The value or, by an all-ones mask, its negative.
+int32_t NegateIf(int32_t mask, int32_t value) { return Mp::WrapSub(value ^ mask, mask); }
 
 }  // namespace
 
 extern "C" {
 
 M_Fixed M_FixMul(M_Fixed a, M_Fixed b) {
-  // The product is to lose 16 bits. Where the operands have 17 trailing zeros between them, both
-  // are shifted by zeros only and nothing is lost; otherwise each gives up its low 8 bits.
-  int shiftA = 8;
-  int shiftB = 8;
-  // With a bit set in both low bytes there are 14 zeros at the most; no need to count them.
-  if ((a & 0xFF) == 0 || (b & 0xFF) == 0) {
-    const int zerosA = Mp::TrailingZeros(Mp::Magnitude(a));
-    if (zerosA >= 17) {
-      shiftA = 16;
-      shiftB = 0;
-    } else if (zerosA + Mp::TrailingZeros(Mp::Magnitude(b)) >= 17) {
-      shiftA = zerosA;
-      shiftB = 16 - zerosA;
-    }
-  }
-  return CheckSign(a, b, Mp::WrapMul(a >> shiftA, b >> shiftB));
+  // The product is to lose 16 bits. Where the operands have 17 trailing zeros between them, which
+  // are those of their product, both are shifted by zeros only and nothing is lost; otherwise each
+  // gives up its low 8 bits.
+  const bool isExact = (Mp::WrapMul(a, b) & 0x1FFFF) == 0;
+  const int zeros = std::countr_zero(static_cast<uint32_t>(a) | 0x10000);
+  const int shift = isExact ? zeros : 8;
+  const int32_t result = Mp::WrapMul(a >> shift, b >> (16 - shift));
+  // One of the wrong sign has overflowed; 0 goes with either sign.
+  return NegateIf(SignMask(a, b), result) < 0 ? kError : result;
 }
 
 M_Fixed M_FixDiv(M_Fixed a, M_Fixed b) {
-  uint32_t numerator = Mp::Magnitude(a);
-  uint32_t divisor = Mp::Magnitude(b);
-  const int zeros = Mp::LeadingZeros(numerator);
-  if (zeros >= 16) {
-    numerator <<= 16;
-  } else {
-    // No room for 16 bits: the divisor gives up the rest. The shift is arithmetic, which shows for
-    // a divisor of -32768.0 only.
-    numerator <<= zeros;
-    divisor = static_cast<uint32_t>(static_cast<int32_t>(divisor) >> (16 - zeros));
-  }
+  // The dividend is to gain 16 bits. Where there is no room for all, the divisor gives up the rest;
+  // the shift is arithmetic, which shows for a divisor of -32768.0 only.
+  const uint32_t dividend = Mp::Magnitude(a);
+  const int zeros = std::countl_zero(dividend | 0x8000);
+  const auto divisor =
+      static_cast<uint32_t>(static_cast<int32_t>(Mp::Magnitude(b)) >> (16 - zeros));
   if (divisor == 0) return kError;
-  const auto quotient = static_cast<int32_t>(numerator / divisor);
-  return CheckSign(a, b, (a ^ b) < 0 ? Mp::WrapNegate(quotient) : quotient);
+  const auto quotient = static_cast<int32_t>((dividend << zeros) / divisor);
+  return quotient < 0 ? kError : NegateIf(SignMask(a, b), quotient);
 }
 
 M_Fix24 M_Fix24Mul(M_Fix24 a, M_Fix24 b) {

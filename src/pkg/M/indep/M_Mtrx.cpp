@@ -5,9 +5,11 @@
 
 #include "M_Matrix.h"
 #include "Mp_Err.h"
+#include "Mp_Lanes.h"
 #include "Mp_Matrix.h"
 #include "Mp_Out.h"
 #include "Mp_Tolerance.h"
+#include "Mp_Vector3.h"
 
 namespace {
 
@@ -28,88 +30,163 @@ int32_t ReportFailure(int16_t place, int32_t code, bool isReportable) {
 }
 
 // Gauss-Jordan elimination: what makes the left matrix the identity makes the right one, which was
-// the identity, the inverse. Rows are known when it is compiled, so that both matrices stay in
-// registers.
+// the identity, the inverse. Rows are in the order of their pivots, found without branches, which
+// matrices of all kinds would mislead.
 class Elimination {
  public:
-  [[gnu::always_inline]] explicit Elimination(const M_Matrix3& left)
-      : left_(left), right_(Mp::kIdentity3) {}
-
-  // The first pivot is the largest element of column 0, of equals the last.
-  [[gnu::always_inline]] int32_t Invert(M_Matrix3* dst, bool* reportable) {
-    const double a = std::abs(left_.m[0][0]);
-    const double b = std::abs(left_.m[1][0]);
-    const double c = std::abs(left_.m[2][0]);
-    if (a > b && a > c) return InvertFrom<0, 1, 2>(dst, reportable);
-    if (b > c) return InvertFrom<1, 0, 2>(dst, reportable);
-    return InvertFrom<2, 0, 1>(dst, reportable);
+  explicit Elimination(const M_Matrix3& m) {
+    const double a = std::abs(m.m[0][0]);
+    const double b = std::abs(m.m[1][0]);
+    const double c = std::abs(m.m[2][0]);
+    // The first pivot is the largest element of column 0, of equals the last.
+    const int first = (2 - (b > c)) & -!((a > b) & (a > c));
+    rowOf_[0] = first;
+    rowOf_[1] = first == 0;
+    rowOf_[2] = 2 - (first == 2);
+    for (int i = 0; i < 3; ++i) {
+      const auto &left = m.m[rowOf_[i]], &right = Mp::kIdentity3.m[rowOf_[i]];
+      rows_[i] = {{Pair{left[0], left[1]}, Pair{left[2], right[0]}, Pair{right[1], right[2]}}};
+    }
   }
 
- private:
-  // The second pivot is the larger element of column 1 in the other rows, of equals the later.
-  template <int kFirst, int kRow, int kLaterRow>
-  [[gnu::always_inline]] int32_t InvertFrom(M_Matrix3* dst, bool* reportable) {
-    if (!Reduce<0, kFirst, kRow, kLaterRow>()) return Fail(dst, reportable);
-    return std::abs(left_.m[kRow][1]) > std::abs(left_.m[kLaterRow][1])
-               ? InvertFromSecond<kFirst, kRow, kLaterRow>(dst, reportable)
-               : InvertFromSecond<kFirst, kLaterRow, kRow>(dst, reportable);
-  }
-
-  template <int kFirst, int kSecond, int kThird>
-  [[gnu::always_inline]] int32_t InvertFromSecond(M_Matrix3* dst, bool* reportable) {
-    if (!Reduce<1, kSecond, kFirst, kThird>()) return Fail(dst, reportable);
-    if (Reduce<2, kThird, kFirst, kSecond>()) {
-      const auto& a = right_.m;
-      *dst = {{{a[kFirst][0], a[kFirst][1], a[kFirst][2]},
-               {a[kSecond][0], a[kSecond][1], a[kSecond][2]},
-               {a[kThird][0], a[kThird][1], a[kThird][2]}}};
+  // A failure leaves dst half-way, its rows not yet in order.
+  int32_t Invert(M_Matrix3* dst) {
+    if (!Reduce(0)) return Fail(dst);
+    ChooseSecond();
+    if (!Reduce(1)) return Fail(dst);
+    if (Reduce(2)) {
+      for (int i = 0; i < 3; ++i) StoreRight(i, dst->m[i]);
     } else {
-      // Kept on purpose: a zero last pivot is no failure. The result is 0 and dst stays half-way,
-      // its rows not yet in order.
-      *dst = right_;
+      // Kept on purpose: a zero last pivot is no failure, but for what it leaves.
+      Fail(dst);
     }
     return 0;
   }
 
-  // Makes column c 1 in the pivot's row and 0 in the others. False, with nothing done, for a pivot
-  // that is too small. Left of c nothing is looked at any more.
-  template <int kColumn, int kPivot, int kOther1, int kOther2>
-  [[gnu::always_inline]] bool Reduce() {
-    const double pivot = left_.m[kPivot][kColumn];
+ private:
+  using Pair = Mp::Lanes<2>::Doubles;
+  using PairBits = Mp::Lanes<2>::Bits;
+  // Of the left matrix and then of the right one.
+  struct Row {
+    Pair pairs[3];
+  };
+
+  static double Element(const Row& row, int column) { return row.pairs[column / 2][column % 2]; }
+
+  // Makes a column 1 in the row of its number and 0 in the others; left of it nothing is looked at
+  // any more. False, with nothing done, for a pivot that is too small.
+  bool Reduce(int column) {
+    Row& pivotRow = rows_[column];
+    const double pivot = Element(pivotRow, column);
     if (-1e-20 < pivot && pivot < 1e-20) return false;
     const double r = 1.0 / pivot;
-    for (int j = kColumn + 1; j < 3; ++j) left_.m[kPivot][j] *= r;
-    for (int j = 0; j < 3; ++j) right_.m[kPivot][j] *= r;
-    Subtract<kColumn, kPivot, kOther1>();
-    Subtract<kColumn, kPivot, kOther2>();
+    for (Pair& pair : pivotRow.pairs) pair *= r;
+    for (int i = 0; i < 3; ++i) {
+      if (i == column) continue;
+      const double factor = Element(rows_[i], column);
+      for (int k = 0; k < 3; ++k) rows_[i].pairs[k] -= factor * pivotRow.pairs[k];
+    }
     return true;
   }
 
-  // Whole rows on the right, zeros included.
-  template <int kColumn, int kPivot, int kRow>
-  [[gnu::always_inline]] void Subtract() {
-    const double factor = left_.m[kRow][kColumn];
-    for (int j = kColumn + 1; j < 3; ++j) left_.m[kRow][j] -= factor * left_.m[kPivot][j];
-    for (int j = 0; j < 3; ++j) right_.m[kRow][j] -= factor * right_.m[kPivot][j];
+  // The second pivot is the larger element of column 1 in the other rows, of equals the later.
+  void ChooseSecond() {
+    const bool isLater = !(std::abs(Element(rows_[1], 1)) > std::abs(Element(rows_[2], 1)));
+    const PairBits mask = PairBits{} - isLater;
+    for (int k = 0; k < 3; ++k) {
+      Pair &p = rows_[1].pairs[k], &q = rows_[2].pairs[k];
+      const auto pBits = reinterpret_cast<PairBits>(p), qBits = reinterpret_cast<PairBits>(q);
+      const PairBits change = (pBits ^ qBits) & mask;
+      p = reinterpret_cast<Pair>(pBits ^ change);
+      q = reinterpret_cast<Pair>(qBits ^ change);
+    }
+    const int change = (rowOf_[1] ^ rowOf_[2]) & -isLater;
+    rowOf_[1] ^= change;
+    rowOf_[2] ^= change;
   }
 
-  [[gnu::always_inline]] int32_t Fail(M_Matrix3* dst, bool* reportable) const {
-    *dst = right_;
-    Mp::Store(reportable, true);
+  void StoreRight(int i, double* to) const {
+    to[0] = rows_[i].pairs[1][1];
+    Mp::Store(to + 1, rows_[i].pairs[2]);
+  }
+
+  int32_t Fail(M_Matrix3* dst) const {
+    for (int i = 0; i < 3; ++i) StoreRight(i, dst->m[rowOf_[i]]);
     return M_ERR_NOT_INVERTIBLE;
   }
 
-  M_Matrix3 left_;
-  M_Matrix3 right_;
+  Row rows_[3];
+  int rowOf_[3];  // Of the given matrix.
 };
 
-void MinorsOfRow(const double* row0, const double* row1, const double* row2, double* minors) {
-  minors[0] = Mp::Determinant(row0, row1, row2, 1, 2, 3);
-  minors[1] = Mp::Determinant(row0, row1, row2, 0, 2, 3);
-  minors[2] = Mp::Determinant(row0, row1, row2, 0, 1, 3);
-  minors[3] = Mp::Determinant(row0, row1, row2, 0, 1, 2);
+// Four columns at once: the same source is compiled for the baseline and for AVX2.
+using Row = Mp::Lanes<4>::Doubles;
+
+// What is left of a row without column 0, 1, 2 and 3, each in its lane.
+[[gnu::always_inline]] inline M_Vector3T<Row> WithoutEach(const double* row) {
+  const auto r = Mp::Load<Row>(row);
+  return {__builtin_shufflevector(r, r, 1, 0, 0, 0), __builtin_shufflevector(r, r, 2, 2, 1, 1),
+          __builtin_shufflevector(r, r, 3, 3, 3, 2)};
 }
 
+// All minors: lane j of row i is the determinant without row i and column j. Two of the rows of
+// minors share the cross product of their last two rows.
+struct Minors {
+  Row rows[4];
+
+  [[gnu::always_inline]] explicit Minors(const M_Matrix4& m) {
+    const auto row0 = WithoutEach(m.m[0]), row1 = WithoutEach(m.m[1]), row2 = WithoutEach(m.m[2]),
+               row3 = WithoutEach(m.m[3]);
+    const M_Vector3T<Row> lastTwo = Mp::Cross(row2, row3);
+    rows[0] = Mp::Dot(row1, lastTwo);
+    rows[1] = Mp::Dot(row0, lastTwo);
+    rows[2] = Mp::Dot(row0, Mp::Cross(row1, row3));
+    rows[3] = Mp::Dot(row0, Mp::Cross(row1, row2));
+  }
+};
+
+// The determinant, by the minors of the first row.
+[[gnu::always_inline]] inline double Expand(const double* row, const Row& minors) {
+  const Row terms = Mp::Load<Row>(row) * minors;
+  return terms[0] - terms[1] + terms[2] - terms[3];
+}
+
+[[gnu::always_inline]] inline double DeterminantInLanes(const M_Matrix4& m) {
+  const M_Vector3T<Row> lastTwo = Mp::Cross(WithoutEach(m.m[2]), WithoutEach(m.m[3]));
+  return Expand(m.m[0], Mp::Dot(WithoutEach(m.m[1]), lastTwo));
+}
+
+// The inverse or, where there is none, the adjugate. False then.
+[[gnu::always_inline]] inline bool InvertInLanes(const M_Matrix4& src, M_Matrix4* dst) {
+  const Minors minors(src);
+  const double det = Expand(src.m[0], minors.rows[0]);
+  const bool isSingular = std::abs(det) < 1e-16;
+  // Divided by 1 the adjugate stays as it is.
+  const double divisor = isSingular ? 1.0 : det;
+  const auto& r = minors.rows;
+  const Row even01 = __builtin_shufflevector(r[0], r[1], 0, 4, 2, 6);
+  const Row odd01 = __builtin_shufflevector(r[0], r[1], 1, 5, 3, 7);
+  const Row even23 = __builtin_shufflevector(r[2], r[3], 0, 4, 2, 6);
+  const Row odd23 = __builtin_shufflevector(r[2], r[3], 1, 5, 3, 7);
+  using Bits = Mp::Lanes<4>::Bits;
+  constexpr uint64_t kMinus = uint64_t{1} << 63;
+  const Bits evenSigns = {0, kMinus, 0, kMinus}, oddSigns = {kMinus, 0, kMinus, 0};
+  const auto store = [&](int i, const Row& transposed, const Bits& signs)
+      __attribute__((always_inline)) {
+    Mp::Store(dst->m[i],
+              reinterpret_cast<Row>(reinterpret_cast<Bits>(transposed) ^ signs) / divisor);
+  };
+  store(0, __builtin_shufflevector(even01, even23, 0, 1, 4, 5), evenSigns);
+  store(1, __builtin_shufflevector(odd01, odd23, 0, 1, 4, 5), oddSigns);
+  store(2, __builtin_shufflevector(even01, even23, 2, 3, 6, 7), evenSigns);
+  store(3, __builtin_shufflevector(odd01, odd23, 2, 3, 6, 7), oddSigns);
+  return !isSingular;
+}
+
+MP_TARGET_AVX2 double DeterminantWithAvx2(const M_Matrix4& m) { return DeterminantInLanes(m); }
+MP_TARGET_AVX2 bool InvertWithAvx2(const M_Matrix4& src, M_Matrix4* dst) {
+  return InvertInLanes(src, dst);
+}
 }  // namespace
 
 bool M_EqualMatrixWithinEpsilon(const M_Matrix3& a, const M_Matrix3& b, double eps) {
@@ -179,8 +256,9 @@ int32_t M_GetMatrixType(const M_Matrix3* m, uint32_t* type) {
 }
 
 int32_t M_InverseMatrixQuiet(const M_Matrix3* src, M_Matrix3* dst, bool* reportable) {
-  Mp::Store(reportable, false);
-  return Elimination(*src).Invert(dst, reportable);
+  const int32_t code = Elimination(*src).Invert(dst);
+  Mp::Store(reportable, code != 0);
+  return code;
 }
 
 int32_t M_InverseMatrix(const M_Matrix3* src, M_Matrix3* dst) {
@@ -229,15 +307,10 @@ int32_t M_TransposeMatrix4(const M_Matrix4* src, M_Matrix4* dst) {
 }
 
 int32_t M_GetMatrix3DeterminantPlus(const M_Matrix4* m, double* det, M_Matrix4* minors) {
-  const auto& a = m->m;
-  double first[4];
-  MinorsOfRow(a[1], a[2], a[3], first);
-  *det = a[0][0] * first[0] - a[0][1] * first[1] + a[0][2] * first[2] - a[0][3] * first[3];
+  *det = Mp::HasAvx2() ? DeterminantWithAvx2(*m) : DeterminantInLanes(*m);
   if (minors) {
-    std::copy(first, first + 4, minors->m[0]);
-    MinorsOfRow(a[0], a[2], a[3], minors->m[1]);
-    MinorsOfRow(a[0], a[1], a[3], minors->m[2]);
-    MinorsOfRow(a[0], a[1], a[2], minors->m[3]);
+    const Minors all(*m);
+    for (int i = 0; i < 4; ++i) Mp::Store(minors->m[i], all.rows[i]);
   }
   return 0;
 }
@@ -247,20 +320,9 @@ int32_t M_GetMatrix4Determinant(const M_Matrix4* m, double* det) {
 }
 
 int32_t M_InverseMatrix4Quiet(const M_Matrix4* src, M_Matrix4* dst, bool* reportable) {
-  double det;
-  M_Matrix4 minors;
-  M_GetMatrix3DeterminantPlus(src, &det, &minors);
-  const bool isSingular = std::abs(det) < 1e-16;
-  // Divided by 1 the adjugate stays as it is.
-  const double divisor = isSingular ? 1.0 : det;
-  for (int i = 0; i < 4; ++i) {
-    for (int j = 0; j < 4; ++j) {
-      const double minor = minors.m[j][i];
-      dst->m[i][j] = ((i + j) % 2 == 0 ? minor : -minor) / divisor;
-    }
-  }
-  Mp::Store(reportable, isSingular);
-  return isSingular ? M_ERR_NOT_INVERTIBLE : 0;
+  const bool isInverted = Mp::HasAvx2() ? InvertWithAvx2(*src, dst) : InvertInLanes(*src, dst);
+  Mp::Store(reportable, !isInverted);
+  return isInverted ? 0 : M_ERR_NOT_INVERTIBLE;
 }
 
 int32_t M_InverseMatrix4(const M_Matrix4* src, M_Matrix4* dst) {

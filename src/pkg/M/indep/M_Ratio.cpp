@@ -1,4 +1,7 @@
 #include "M_Utils.h"
+
+#include <bit>
+
 #include "Mp_Arith.h"
 #include "Mp_Bits.h"
 #include "Mp_Err.h"
@@ -82,9 +85,8 @@ bool Cancel(int32_t* num, uint32_t* den) {
 bool Cancel(M_Ratio* r) { return Cancel(&r->num, &r->den); }
 
 // What has 15 bits can be multiplied and its products added in 32 without asking further.
-constexpr uint32_t kSmall = 0x8000;
-
 bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
+  constexpr uint32_t kSmall = 0x8000;
   return (Mp::Magnitude(a.num) | a.den | Mp::Magnitude(b.num) | b.den) < kSmall;
 }
 
@@ -105,17 +107,24 @@ bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
     *sum = {Mp::WrapAdd(a.num, bNum), a.den};
     return true;
   }
-  const uint32_t gcd = Mp::Gcd(a.den, b.den);
+  uint32_t gcd;
+  const bool areSmall = AreSmall(a, b);
+  if (areSmall) {
+    gcd = Mp::Gcd(a.den, b.den);
+  } else {
+    // The common denominator b.den / gcd x a.den is predicted to fit where the first factor has no
+    // more bits than the second leaves, which asks for a gcd above this.
+    const uint32_t tooSmall = b.den >> std::countl_zero(a.den);
+    gcd = Mp::Gcd<true>(a.den, b.den, tooSmall);
+    if (gcd <= tooSmall) return false;
+  }
   const uint32_t aFactor = b.den / gcd;
-  const uint32_t bFactor = a.den / gcd;
   const auto aScale = static_cast<int32_t>(aFactor);
-  const auto bScale = static_cast<int32_t>(bFactor);
+  const auto bScale = static_cast<int32_t>(a.den / gcd);
   const int32_t aTerm = Mp::WrapMul(aScale, a.num);
   const int32_t bTerm = Mp::WrapMul(bScale, bNum);
-  // A factor of 2^31 or more is caught by the first test.
-  if (!AreSmall(a, b) &&
-      (Mp::UMulWouldOverflow(aFactor, a.den) || Mp::MulWouldOverflow(aScale, a.num) ||
-       Mp::MulWouldOverflow(bScale, bNum) || Mp::AddWouldOverflow(aTerm, bTerm))) {
+  if (!areSmall && (Mp::MulWouldOverflow(aScale, a.num) || Mp::MulWouldOverflow(bScale, bNum) ||
+                    Mp::AddWouldOverflow(aTerm, bTerm))) {
     return false;
   }
   *sum = {Mp::WrapAdd(aTerm, bTerm), aFactor * a.den};
@@ -123,10 +132,7 @@ bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
 }
 
 [[gnu::always_inline]] inline bool TryProduct(M_Ratio a, M_Ratio b, M_Ratio* product) {
-  if (!AreSmall(a, b) &&
-      (Mp::UMulWouldOverflow(a.den, b.den) || Mp::MulWouldOverflow(a.num, b.num))) {
-    return false;
-  }
+  if (Mp::UMulWouldOverflow(a.den, b.den) || Mp::MulWouldOverflow(a.num, b.num)) return false;
   *product = {Mp::WrapMul(a.num, b.num), a.den * b.den};
   return true;
 }
@@ -139,20 +145,17 @@ bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
   M_Ratio a = *givenA;
   M_Ratio b = *givenB;
   if (a.den == 0 || b.den == 0) return FailZeroDenominator(Mp_PLACE_CALC_RATIO, detail, out);
+  bool hasCancelled = Cancel(&a);
+  hasCancelled |= Cancel(&b);
   unsigned char outcome = kExact;
-  do {
-    const bool hasCancelledA = Cancel(&a);
-    const bool hasCancelledB = Cancel(&b);
-    if (!hasCancelledA && !hasCancelledB) {
-      outcome = kOverflow;
-      if (mayApproximate) {
-        const double x = ToDouble(*givenA);
-        const double y = ToDouble(*givenB);
-        outcome = Approximate(subtract ? x - y : x + y, out);
-      }
-      break;
+  if (!hasCancelled || !TrySum(a, b, subtract, out)) {
+    outcome = kOverflow;
+    if (mayApproximate) {
+      const double x = ToDouble(*givenA);
+      const double y = ToDouble(*givenB);
+      outcome = Approximate(subtract ? x - y : x + y, out);
     }
-  } while (!TrySum(a, b, subtract, out));
+  }
   return Finish(outcome, Mp_PLACE_CALC_RATIO, detail, out, status);
 }
 

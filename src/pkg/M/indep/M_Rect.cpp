@@ -7,6 +7,7 @@
 #include <cmath>
 
 #include "Mp_Arith.h"
+#include "Mp_Lanes.h"
 #include "Mp_Rect.h"
 
 namespace {
@@ -98,21 +99,30 @@ int32_t Span(const Point* a, const Point* b, Rect* r) {
   return Set(r, left, top, right, bottom);
 }
 
+// All edges at once, in a record's own order: two starts, left and top, and then their ends.
 template <class Rect>
-Rect InnerEdges(const Rect& a, const Rect& b) {
-  Rect inner;
-  Set(&inner, std::max(a.left, b.left), std::max(a.top, b.top), std::min(a.right, b.right),
-      std::min(a.bottom, b.bottom));
-  return inner;
-}
+struct Edges {
+  typedef EdgeOf<Rect> Vector __attribute__((vector_size(sizeof(Rect))));
+
+  // The greater starts and lesser ends of two, or else the lesser starts and greater ends.
+  static Vector Choose(const Rect& a, const Rect& b, bool isInner) {
+    const EdgeOf<Rect> forStarts = isInner ? 0 : -1, forEnds = ~forStarts;
+    const auto p = Mp::Load<Vector>(&a);
+    const auto q = Mp::Load<Vector>(&b);
+    const Vector isFirst = (p > q) ^ Vector { forStarts, forStarts, forEnds, forEnds };
+    return (p & isFirst) | (q & ~isFirst);
+  }
+};
 
 // An empty rectangle has no inner edges in order with any other, so it need not be tested.
 template <class Rect>
 int32_t Intersect(const Rect* a, const Rect* b, Rect* out) {
-  const Rect inner = InnerEdges(*a, *b);
-  const bool isOverlap = !IsEmpty(inner);
-  if (out) *out = isOverlap ? inner : Rect{};
-  return isOverlap;
+  using Vector = typename Edges<Rect>::Vector;
+  const Vector inner = Edges<Rect>::Choose(*a, *b, true);
+  const Vector isAfter = __builtin_shufflevector(inner, inner, 2, 3, 0, 1) > inner;
+  const EdgeOf<Rect> isOverlap = isAfter[0] & isAfter[1];
+  if (out) Mp::Store(out, inner & isOverlap);
+  return -isOverlap;
 }
 
 template <class Rect>
@@ -123,8 +133,8 @@ int32_t Unite(const Rect* a, const Rect* b, Rect* out) {
     return Copy(a, out);
   }
   if (IsEmpty(*a)) return Copy(b, out);
-  return Set(out, std::min(a->left, b->left), std::min(a->top, b->top),
-             std::max(a->right, b->right), std::max(a->bottom, b->bottom));
+  Mp::Store(out, Edges<Rect>::Choose(*a, *b, false));
+  return 0;
 }
 
 // Kept on purpose: where the short rectangles compare all edges, the others compare two.
@@ -321,14 +331,20 @@ int32_t M_SectFixedRect(const M_FixedRect* a, const M_FixedRect* b, M_FixedRect*
 
 // Apart from the others: what a NaN does depends on the form of each test.
 int32_t M_SectFloatRect(const M_FloatRect* a, const M_FloatRect* b, M_FloatRect* out) {
-  const auto isEmpty = [](const M_FloatRect& r) { return r.left >= r.right || r.top >= r.bottom; };
-  const auto least = [](double p, double q) { return p < q ? p : q; };
-  const auto greatest = [](double p, double q) { return p > q ? p : q; };
-  const M_FloatRect inner = {greatest(a->left, b->left), greatest(a->top, b->top),
-                             least(a->right, b->right), least(a->bottom, b->bottom)};
-  const bool isOverlap =
-      !isEmpty(*a) && !isEmpty(*b) && inner.bottom > inner.top && inner.right > inner.left;
-  if (out) *out = isOverlap ? inner : M_FloatRect{};
+  using Pair = Mp::Lanes<2>;
+  const auto startsA = Mp::Load<Pair::Doubles>(&a->left),
+             endsA = Mp::Load<Pair::Doubles>(&a->right);
+  const auto startsB = Mp::Load<Pair::Doubles>(&b->left),
+             endsB = Mp::Load<Pair::Doubles>(&b->right);
+  const Pair::Doubles starts = startsA > startsB ? startsA : startsB;
+  const Pair::Doubles ends = endsA < endsB ? endsA : endsB;
+  const auto holds = (ends > starts) & ~((startsA >= endsA) | (startsB >= endsB));
+  const bool isOverlap = (holds[0] & holds[1]) != 0;
+  if (out) {
+    const auto kept = Pair::Bits{} - isOverlap;
+    Mp::Store(&out->left, reinterpret_cast<Pair::Bits>(starts) & kept);
+    Mp::Store(&out->right, reinterpret_cast<Pair::Bits>(ends) & kept);
+  }
   return isOverlap;
 }
 

@@ -1,6 +1,6 @@
 /// \file
-/// Bit counting through the nibble tables, the overflow predictions that rest on it, and the
-/// greatest common divisor.
+/// Bit counting through the nibble tables, the overflow predictions, and the greatest common
+/// divisor.
 #ifndef MP_BITS_H
 #define MP_BITS_H
 
@@ -60,19 +60,31 @@ inline bool AddWouldOverflow(int32_t a, int32_t b) {
   return ((sum ^ a) & (sum ^ b)) < 0;
 }
 
-/// By bit lengths only: at times true for a product that fits, never false for one that does not.
+/// By bit lengths only, which have to be at most 31 together: at times true for a product that
+/// fits, never false for one that does not. A product tells the sum of its factors' lengths but for
+/// one octave, where they are counted. A zero has no length, and a one in its place tells the same.
 inline bool MulWouldOverflow(int32_t a, int32_t b) {
-  return LeadingZeros(Magnitude(a)) + LeadingZeros(Magnitude(b)) < 33;
+  const uint32_t x = Magnitude(a);
+  const uint32_t y = Magnitude(b);
+  const uint64_t product = uint64_t{x + (x == 0)} * (y + (y == 0));
+  constexpr uint64_t kOctave = uint64_t{1} << 30;
+  if (product - kOctave >= kOctave) return product >= kOctave;
+  return LeadingZeros(x) + LeadingZeros(y) < 33;
 }
 
 /// As MulWouldOverflow, for 32 unsigned bits.
 inline bool UMulWouldOverflow(uint32_t a, uint32_t b) {
+  const uint64_t product = uint64_t{a} * b;
+  constexpr uint64_t kOctave = uint64_t{1} << 31;
+  if (product - kOctave >= kOctave) return product >= kOctave;
   return LeadingZeros(a) + LeadingZeros(b) < 32;
 }
 
 /// gcd(a, b), but 1 when b is 0. One remainder brings both operands to the same size; subtraction
-/// and shifts, which need no division, find the rest.
-inline uint32_t Gcd(uint32_t a, uint32_t b) {
+/// and shifts, which need no division, find the rest. A limited one ends early, with anything else
+/// that is not above the limit, where it would not be above it.
+template <bool kIsLimited = false>
+uint32_t Gcd(uint32_t a, uint32_t b, uint32_t limit = 0) {
   if (b == 0) return 1;
   if (a < b) {
     if (a == 0) return b;
@@ -92,7 +104,7 @@ inline uint32_t Gcd(uint32_t a, uint32_t b) {
     shift = std::countr_zero(static_cast<uint64_t>(difference));
     b = static_cast<uint32_t>(a + (difference & mask));
     a = static_cast<uint32_t>((difference ^ mask) - mask);
-  } while (a != 0);
+  } while (a != 0 && (!kIsLimited || b > limit >> twos));
   return b << twos;
 }
 

@@ -8,6 +8,11 @@
 #include <cstdint>
 #include <cstring>
 
+// How wide vectors cross a call without AVX, which none does.
+#if defined(__GNUC__) && !defined(__clang__)
+#pragma GCC diagnostic ignored "-Wpsabi"
+#endif
+
 namespace Mp {
 
 // A function compiled for AVX2, and whether it may be called; elsewhere, and where AVX2 is left

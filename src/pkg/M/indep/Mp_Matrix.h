@@ -35,14 +35,6 @@ Matrix Product(const Matrix& a, const Matrix& b) {
   return product;
 }
 
-/// The determinant of columns c0, c1 and c2 of three rows.
-inline double Determinant(const double* row0, const double* row1, const double* row2, int c0,
-                          int c1, int c2) {
-  return row0[c0] * (row1[c1] * row2[c2] - row1[c2] * row2[c1]) +
-         row0[c1] * (row1[c2] * row2[c0] - row1[c0] * row2[c2]) +
-         row0[c2] * (row1[c0] * row2[c1] - row1[c1] * row2[c0]);
-}
-
 /// Whether no element of a differs from b's by more than eps; a NaN does not.
 template <class Matrix>
 bool IsEqualWithin(const Matrix& a, const Matrix& b, double eps) {

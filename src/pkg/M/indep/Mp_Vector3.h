@@ -27,11 +27,14 @@ inline M_Vector3T<double> Divided(const M_Vector3T<double>& a, double divisor) {
   return {a.x / divisor, a.y / divisor, a.z / divisor};
 }
 
-inline double Dot(const M_Vector3T<double>& a, const M_Vector3T<double>& b) {
+/// Of numbers, or of vectors of them.
+template <class T>
+[[gnu::always_inline]] inline T Dot(const M_Vector3T<T>& a, const M_Vector3T<T>& b) {
   return a.x * b.x + a.y * b.y + a.z * b.z;
 }
 
-inline M_Vector3T<double> Cross(const M_Vector3T<double>& a, const M_Vector3T<double>& b) {
+template <class T>
+[[gnu::always_inline]] inline M_Vector3T<T> Cross(const M_Vector3T<T>& a, const M_Vector3T<T>& b) {
   return {a.y * b.z - a.z * b.y, a.z * b.x - a.x * b.z, a.x * b.y - a.y * b.x};
 }
 
