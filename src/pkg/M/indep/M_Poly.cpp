@@ -1,7 +1,6 @@
 // Point in polygon, the area of a polygon, and quads seen edge-on.
 
 #include <algorithm>
-#include <array>
 #include <bit>
 #include <cmath>
 #include <cstdint>
@@ -56,39 +55,95 @@ bool IsNearEdge(const Vector2& p, const Vector2& a, const Vector2& b, double squ
   return squaredTolerance >= SquaredDistance(p, a) || squaredTolerance >= SquaredDistance(p, b);
 }
 
-// Bit i tells whether point i lies before x, for up to 64 points.
-template <class Point>
-uint64_t FindBefore(const Point* points, int32_t count, decltype(Point::x) x) {
-  using Doubles = Mp::Lanes<2>::Doubles;
-  using Bits = Mp::Lanes<2>::Bits;
-  const Doubles limit = {x, x};
-  Bits pairs = {};
-  const int32_t even = count & ~1;
-  for (int32_t i = even - 2; i >= 0; i -= 2) {
-    const Doubles pair = {points[i].x, points[i + 1].x};
-    pairs = pairs << 2 | (static_cast<Bits>(pair < limit) & Bits{1, 2});
+// Whether, along one axis, the edge from a to b is so far away that IsNearEdge cannot hold for p,
+// whatever is rounded there: that is relative to the distance or to the edge's extent, and far less
+// than the margin. Where something is not finite, nothing is known.
+bool IsFar(double p, double a, double b, double reach) {
+  constexpr double kMargin = 1e-9;
+  const double distance = std::max(std::min(a, b) - p, p - std::max(a, b));
+  return distance > reach + kMargin * (reach + std::abs(b - a));
+}
+
+bool IsNearOutline(const Vector2& p, const auto& corner, int32_t count, double squaredTolerance) {
+  // Far below it squares have no digits left.
+  const double reach = std::max(std::sqrt(squaredTolerance), 1e-150);
+  Vector2 a = corner(0);
+  for (int32_t i = 1; i <= count; ++i) {
+    const Vector2 b = corner(i < count ? i : 0);
+    const bool isFar = IsFar(p.x, a.x, b.x, reach) | IsFar(p.y, a.y, b.y, reach);
+    if (!isFar && IsNearEdge(p, a, b, squaredTolerance)) return true;
+    a = b;
   }
-  uint64_t before = pairs[0] | pairs[1];
-  if (even < count) before |= uint64_t{points[even].x < x} << even;
+  return false;
+}
+
+// The coordinates x of two points, or of points 0, 2, 1 and 3.
+template <int kLanes, class Point>
+[[gnu::always_inline]] inline auto LoadX(const Point* points) {
+  using Doubles = typename Mp::Lanes<kLanes>::Doubles;
+  if constexpr (kLanes == 2) {
+    return Doubles{points[0].x, points[1].x};
+  } else if constexpr (sizeof(Point) == 2 * sizeof(double)) {
+    return __builtin_shufflevector(Mp::Load<Doubles>(points), Mp::Load<Doubles>(points + 2), 0, 4,
+                                   2, 6);
+  } else {
+    return Doubles{points[0].x, points[2].x, points[1].x, points[3].x};
+  }
+}
+
+// Bit i tells whether point i lies before x, for up to 64 points.
+template <int kLanes, class Point>
+[[gnu::always_inline]] inline uint64_t FindBefore(const Point* points, int32_t count,
+                                                  decltype(Point::x) x) {
+  using Bits = typename Mp::Lanes<kLanes>::Bits;
+  const auto limit = typename Mp::Lanes<kLanes>::Doubles{} + double{x};
+  // Of the first points, in the order in which they are loaded.
+  Bits places = {1, 2};
+  if constexpr (kLanes == 4) places = Bits{1, 4, 2, 8};
+  Bits groups = {};
+  uint64_t before = 0;
+  const int32_t whole = count - count % kLanes;
+  for (int32_t i = whole; i < count; ++i) before |= uint64_t{points[i].x < x} << i;
+  for (int32_t i = whole - kLanes; i >= 0; i -= kLanes) {
+    groups = groups << kLanes | (static_cast<Bits>(LoadX<kLanes>(points + i) < limit) & places);
+  }
+  for (int lane = 0; lane < kLanes; ++lane) before |= groups[lane];
   return before;
 }
 
-// The edges of a polygon, edge i from point i to the next, that straddle x; returns how many. An
-// end at x lies behind it: so a vertex belongs to one of its edges, and an upright edge to nobody.
-// An edge with a NaN among them does no harm: what is computed for it is a NaN.
-template <class Point>
-int32_t FindStraddling(const Point* poly, int32_t count, decltype(Point::x) x, int32_t* edges) {
-  constexpr int32_t kBlock = 64;
+// Bit i tells whether edge i, from point i on to the next, straddles x, for up to 64 edges; `end`
+// is behind the last. A point at x lies behind it: so a vertex belongs to one of its edges, and an
+// upright edge to nobody.
+template <int kLanes, class Point>
+[[gnu::always_inline]] inline uint64_t FindStraddling(const Point* points, int32_t count,
+                                                      const Point& end, decltype(Point::x) x) {
+  const uint64_t before = FindBefore<kLanes>(points, count, x);
+  return before ^ (before >> 1 | uint64_t{end.x < x} << (count - 1));
+}
+
+constexpr int32_t kBlock = 64;
+
+// The edges of a polygon that straddle x; returns how many.
+template <int kLanes, class Point>
+[[gnu::always_inline]] inline int32_t ListStraddling(const Point* poly, int32_t count,
+                                                     decltype(Point::x) x, int32_t* edges) {
   int32_t found = 0;
   int32_t size;
   for (int32_t i = 0; i < count; i += size) {
     size = std::min(count - i, kBlock);
-    const uint64_t before = FindBefore(poly + i, size, x);
-    const uint64_t last = poly[i + size < count ? i + size : 0].x < x;
-    uint64_t changes = before ^ (before >> 1 | last << (size - 1));
-    for (; changes != 0; changes &= changes - 1) edges[found++] = i + std::countr_zero(changes);
+    const Point& end = poly[i + size < count ? i + size : 0];
+    uint64_t straddling = FindStraddling<kLanes>(poly + i, size, end, x);
+    for (; straddling != 0; straddling &= straddling - 1) {
+      edges[found++] = i + std::countr_zero(straddling);
+    }
   }
   return found;
+}
+
+template <class Point>
+MP_TARGET_AVX2 int32_t ListWithAvx2(const Point* poly, int32_t count, decltype(Point::x) x,
+                                    int32_t* edges) {
+  return ListStraddling<4>(poly, count, x, edges);
 }
 
 // A point that all points of the polygon coincide with.
@@ -108,34 +163,37 @@ bool IsAtPoint(const M_Vector2T<float>& p, const M_Vector2T<float>& q, double sq
 // a single point.
 template <class Point>
 bool IsInside(const Point& p, const Point* poly, int32_t count, double squaredTolerance) {
-  constexpr int32_t kOnStack = 64;
-  std::array<int32_t, kOnStack> few;
-  std::unique_ptr<int32_t[]> many;
-  if (count > kOnStack) many.reset(new int32_t[static_cast<size_t>(count)]);
-  int32_t* const edges = many ? many.get() : few.data();
+  std::unique_ptr<int32_t[]> edges;
+  if (count > kBlock) edges.reset(new int32_t[static_cast<size_t>(count)]);
 
   const auto isFirst = [&](const Point& q) { return IsSameBitwise(q, poly[0]); };
   if (std::all_of(poly + 1, poly + count, isFirst)) {
     return IsAtPoint(p, poly[0], squaredTolerance);
   }
   const Vector2 wide = Widen(p);
-  const auto next = [&](int32_t i) { return Widen(poly[i + 1 < count ? i + 1 : 0]); };
-  if (squaredTolerance > 0) {
-    for (int32_t i = 0; i < count; ++i) {
-      if (IsNearEdge(wide, Widen(poly[i]), next(i), squaredTolerance)) return true;
-    }
-  }
+  const auto corner = [poly](int32_t i) { return Widen(poly[i]); };
+  if (squaredTolerance > 0 && IsNearOutline(wide, corner, count, squaredTolerance)) return true;
 
-  const int32_t found = FindStraddling(poly, count, p.x, edges);
   bool isOdd = false;
-  for (int32_t i = 0; i < found; ++i) {
-    const Vector2 a = Widen(poly[edges[i]]);
-    const Vector2 b = next(edges[i]);
+  // Whether the point is on an edge; else the edge counts if it lies above. One with a NaN does no
+  // harm: what is computed for it is a NaN.
+  const auto isOn = [&](int32_t edge) {
+    const Vector2 a = corner(edge);
+    const Vector2 b = corner(edge + 1 < count ? edge + 1 : 0);
     const double y = (wide.x - b.x) / (a.x - b.x) * (a.y - b.y) + b.y;
-    if (Mp::IsNearlyEqual(y, wide.y)) return true;
     isOdd ^= y > wide.y;
+    return Mp::IsNearlyEqual(y, wide.y);
+  };
+  if (count <= kBlock) {
+    uint64_t straddling = FindStraddling<2>(poly, count, poly[0], p.x);
+    for (; straddling != 0; straddling &= straddling - 1) {
+      if (isOn(std::countr_zero(straddling))) return true;
+    }
+    return isOdd;
   }
-  return isOdd;
+  const int32_t found = Mp::HasAvx2() ? ListWithAvx2(poly, count, p.x, edges.get())
+                                      : ListStraddling<2>(poly, count, p.x, edges.get());
+  return std::any_of(edges.get(), edges.get() + found, isOn) || isOdd;
 }
 
 // Twice the signed area of a triangle, or of a quadrilateral by its diagonals.

@@ -43,6 +43,8 @@ class ClipLine {
 void Clip(const ClipLine& line, const Polygon& polygon, Polygon* clipped) {
   clipped->clear();
   if (polygon.size() < 3) return;
+  // Where every second point is outside, two crossings stand for it.
+  clipped->reserve(polygon.size() + polygon.size() / 2 + 1);
   const Point* s = &polygon.back();
   double sideOfS = line.Side(*s);
   for (const Point& e : polygon) {

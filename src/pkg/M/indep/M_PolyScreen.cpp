@@ -1,5 +1,6 @@
 // Quads on their way to the screen, and points.
 
+#include <algorithm>
 #include <cmath>
 
 #include "M_Matrix.h"
@@ -140,7 +141,14 @@ void M_TransformPoly3D::TransformPointsToScreen(const M_Matrix4& toScreen) {
     ClearFlags(this);
     return;
   }
-  for (int edge = 0; edge < kCorners; ++edge) ClipEdgeToScreen(edge);
+  bool isCut = false;
+  for (const Vector3& p : points) isCut |= !(p.z >= kNearPlane);
+  if (isCut) {
+    for (int edge = 0; edge < kCorners; ++edge) ClipEdgeToScreen(edge);
+  } else {
+    ClearFlags(this);
+    std::fill(clipPoints, clipPoints + kCorners, Vector3{0, 0, 0});
+  }
   ThrowOnError(M_Transform3DFloatPoints(&toScreen, kCorners, points));
   ThrowOnError(M_Transform3DFloatPoints(&toScreen, kCorners, clipPoints));
   InvalidatePolyPoints();

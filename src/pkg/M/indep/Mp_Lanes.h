@@ -56,20 +56,22 @@ template <int kLanes>
 template <int kLanes>
 struct Triples {
   using Doubles = typename Lanes<kLanes>::Doubles;
+  using Doubles2 = Lanes<2>::Doubles;
   Doubles x, y, z;
 
-  /// From points one behind the other.
+  /// From points one behind the other, two numbers at a time: what has just been written in halves
+  /// would have to be waited for if it were read as a whole.
   [[gnu::always_inline]] static Triples Load(const double* from) {
-    const auto a = Mp::Load<Doubles>(from);
-    const auto b = Mp::Load<Doubles>(from + kLanes);
-    const auto c = Mp::Load<Doubles>(from + kLanes + kLanes);
+    const auto a = Mp::Load<Doubles2>(from);
+    const auto b = Mp::Load<Doubles2>(from + 2);
+    const auto c = Mp::Load<Doubles2>(from + 4);
     if constexpr (kLanes == 2) {  // x y | z x | y z
       return {__builtin_shufflevector(a, b, 0, 3), __builtin_shufflevector(a, c, 1, 2),
               __builtin_shufflevector(b, c, 0, 3)};
-    } else {  // x y z x | y z x y | z x y z
-      const Doubles xy = __builtin_shufflevector(a, b, 0, 1, 6, 7);
-      const Doubles zx = __builtin_shufflevector(a, c, 2, 3, 4, 5);
-      const Doubles yz = __builtin_shufflevector(b, c, 0, 1, 6, 7);
+    } else {
+      const Doubles xy = __builtin_shufflevector(a, Mp::Load<Doubles2>(from + 6), 0, 1, 2, 3);
+      const Doubles zx = __builtin_shufflevector(b, Mp::Load<Doubles2>(from + 8), 0, 1, 2, 3);
+      const Doubles yz = __builtin_shufflevector(c, Mp::Load<Doubles2>(from + 10), 0, 1, 2, 3);
       return {__builtin_shufflevector(xy, zx, 0, 5, 2, 7),
               __builtin_shufflevector(xy, yz, 1, 4, 3, 6),
               __builtin_shufflevector(zx, yz, 0, 5, 2, 7)};
