@@ -10,45 +10,40 @@
 #include "Mp_Strs.h"
 #include "XLOG.h"
 
-thread_local TestHost host;
-thread_local TestMemory memory;
-
 namespace {
 
 thread_local char buffer[4096];
 thread_local int32_t lastError = 99;
 
+// Records a call, and gives what it answers.
 template <class... Args>
-void Note(const char* format, Args... args) {
+int32_t Answer(int32_t usual, const char* format, Args... args) {
   char text[sizeof buffer + 100];
   std::snprintf(text, sizeof text, format, args...);
   host.calls.emplace_back(text);
   if (host.state) host.calls.back().append(host.state());
+  return host.answers < 0 ? usual : host.answers;
 }
 
-int32_t Answer(int32_t usual) { return host.answers < 0 ? usual : host.answers; }
+void Reclaim(U_Handle handle) { std::free(std::exchange(*handle, nullptr)); }
+void Delete(U_Handle handle) {
+  Reclaim(handle);
+  delete handle;
+}
 
-// Filled, so that a table nobody has filled is noticed.
+// The block is filled, so that a table nobody has filled is noticed.
 U_Handle Allocate(size_t bytes) {
-  const bool fails = host.failing & 1;
-  if (host.reclaiming & 1 && !host.handles.empty()) Reclaim(host.handles.back());
-  host.failing >>= 1;
-  host.reclaiming >>= 1;
-  if (fails) return nullptr;
-  host.handles.push_back(new void*(std::memset(std::malloc(bytes), 0xEE, bytes)));
-  return host.handles.back();
+  const unsigned mood = std::exchange(host.moods, host.moods >> 3);
+  for (const auto& handle : host.handles) {
+    if (mood & TestHost::kReclaims) Reclaim(handle.get());
+  }
+  if (mood & TestHost::kFails) return nullptr;
+  host.handles.emplace_back(new void*(std::memset(std::malloc(bytes), 0xEE, bytes)), Delete);
+  if (mood & TestHost::kReclaimsThis) Reclaim(host.handles.back().get());
+  return host.handles.back().get();
 }
 
 }  // namespace
-
-void Reclaim(U_Handle handle) { std::free(std::exchange(*handle, nullptr)); }
-
-void FreeHandles() {
-  for (; !host.handles.empty(); host.handles.pop_back()) {
-    Reclaim(host.handles.back());
-    delete host.handles.back();
-  }
-}
 
 void* operator new(size_t bytes) {
   ++memory.news;
@@ -81,20 +76,17 @@ void U_MemTrackedObject::TrackedDelete(void* block) {
 extern "C" {
 
 U_Handle U_AllocateHandle(uint32_t id, const char* name, size_t bytes) {
-  Note("allocate %x %s %zu", id, name, bytes);
+  Answer(0, "allocate %x %s %zu", id, name, bytes);
   return Allocate(bytes);
 }
-
 U_Handle U_AllocateHandleQuiet(size_t bytes) {
-  Note("allocate %zu", bytes);
+  Answer(0, "allocate %zu", bytes);
   return Allocate(bytes);
 }
-
 void U_FreeHandle(U_Handle handle) {
-  Note("%s", "free");
-  EXPECT_EQ(std::erase(host.handles, handle), 1u) << "freed, but not given";
-  Reclaim(handle);
-  delete handle;
+  Answer(0, "%s", "free");
+  const auto isIt = [&](const auto& given) { return given.get() == handle; };
+  EXPECT_EQ(std::erase_if(host.handles, isIt), 1u) << "freed, but not given";
 }
 
 const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t x, int32_t y) {
@@ -105,40 +97,30 @@ const char* U_ZLookupLStrCache(const void* header, int32_t index, int32_t x, int
 }
 
 char* Up_GetThreadLoggingBuffer(void) { return buffer; }
-
 void Up_SetThreadLastError(int32_t error) {
   lastError = error;
   std::strcpy(buffer, "(not written)");
 }
-
 int32_t Up_ReportError(uint32_t id, int32_t severity) {
   EXPECT_EQ(std::exchange(lastError, 99), 0) << "cleared before a message is written";
-  Note("%x %d %s", id, severity, buffer);
-  return Answer(77);
+  return Answer(77, "%x %d %s", id, severity, buffer);
 }
-
 int32_t Up_ReportErrString(uint32_t id, int32_t severity, const char* text) {
-  Note("%x %d %s", id, severity, text);
-  return Answer(78);
+  return Answer(78, "%x %d %s", id, severity, text);
 }
-
 int32_t Up_ReportVarkErrString(uint32_t id, int32_t severity, int32_t hostError, const char* text) {
-  Note("%x %d host %d %s", id, severity, hostError, text ? text : "-");
-  return Answer(hostError);
+  return Answer(hostError, "%x %d host %d %s", id, severity, hostError, text ? text : "-");
 }
-
 int32_t U_TranslateAndReportException(const std::exception& thrown) {
-  Note("exception %s", thrown.what());
-  return Answer(79);
+  return Answer(79, "exception %s", thrown.what());
 }
 
 int64_t WideMultiply(int32_t a, int32_t b) {
-  Note("multiply %d %d", a, b);
+  Answer(0, "multiply %d %d", a, b);
   return int64_t{a} * b;
 }
-
 void XLOG_Log(int32_t level, const char* component, const char* event, const char* text) {
-  Note("log %d %s %s %s", level, component, event, text);
+  Answer(0, "log %d %s %s %s", level, component, event, text);
 }
 
 }  // extern "C"

@@ -6,6 +6,7 @@
 #define TESTS_TEST_HOST_H
 
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <utility>
 #include <vector>
@@ -15,19 +16,17 @@
 using Calls = std::vector<std::string>;
 
 struct TestHost {
-  Calls calls;                       ///< In order, as text.
-  std::string (*state)() = nullptr;  ///< What to append to each call.
-  int answers = -1;                  ///< What reports return; -1 for what is usual.
-  unsigned failing = 0;           ///< Allocations of handles that fail, a bit each; the first is 1.
-  unsigned reclaiming = 0;        ///< Allocations at which the block given before is reclaimed.
-  std::vector<U_Handle> handles;  ///< Given, and not freed.
+  /// What an allocation does: reclaim what was given before, fail, give what is reclaimed at once.
+  enum Mood { kReclaims = 1, kFails = 2, kReclaimsThis = 4 };
+
+  Calls calls;                                  ///< In order, as text.
+  std::string (*state)() = nullptr;             ///< What to append to each call.
+  int answers = -1;                             ///< What reports return; -1 for what is usual.
+  unsigned moods = 0;                           ///< Of the next allocations, three bits each.
+  std::vector<std::shared_ptr<void*>> handles;  ///< Given, and not freed.
   Calls Take() { return std::exchange(calls, {}); }
 };
-extern thread_local TestHost host;
-
-/// Takes a block away, as a host may; frees all handles.
-void Reclaim(U_Handle handle);
-void FreeHandles();
+inline thread_local TestHost host;
 
 /// Memory of this thread: plain operator new, and the host's tracked blocks.
 struct TestMemory {
@@ -37,6 +36,6 @@ struct TestMemory {
   int trackedBlocks;    ///< Not freed.
   size_t trackedBytes;  ///< Of the last one.
 };
-extern thread_local TestMemory memory;
+inline thread_local TestMemory memory;
 
 #endif  // TESTS_TEST_HOST_H

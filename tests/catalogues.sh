@@ -2,13 +2,9 @@
 # Makes catalogues with good and bad translations of one message, and runs the test that looks it up.
 # Usage: catalogues.sh HOST_TEST
 set -eu
-program=$1
+command -v msgfmt >/dev/null || { echo "msgfmt is not installed"; exit 77; }
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
-if ! command -v msgfmt >/dev/null; then
-  echo "msgfmt is not installed"
-  exit 77
-fi
 long=$(printf '%01021d' 0)
 
 # language, translation, what is to come of it where that is not the translation
@@ -32,5 +28,5 @@ xk|%% %s|overflow %s.
 xl|$long%s
 xm|0$long%s|overflow %s.
 ROWS
-CATALOGUES=$work "$program" --gtest_filter=Messages.OfBadCataloguesAreNotUsed | tee "$work/out"
+CATALOGUES=$work "$1" --gtest_filter=Messages.OfBadCataloguesAreNotUsed | tee "$work/out"
 grep -q '^\[  PASSED  \] 1 test' "$work/out"
