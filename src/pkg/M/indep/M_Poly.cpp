@@ -70,7 +70,7 @@ bool IsNearOutline(const Vector2& p, const auto& corner, int32_t count, double s
   Vector2 a = corner(0);
   for (int32_t i = 1; i <= count; ++i) {
     const Vector2 b = corner(i < count ? i : 0);
-    const bool isFar = IsFar(p.x, a.x, b.x, reach) | IsFar(p.y, a.y, b.y, reach);
+    const bool isFar = IsFar(p.x, a.x, b.x, reach) || IsFar(p.y, a.y, b.y, reach);
     if (!isFar && IsNearEdge(p, a, b, squaredTolerance)) return true;
     a = b;
   }

@@ -9,9 +9,7 @@
 #include <cstring>
 
 // How wide vectors cross a call without AVX, which none does.
-#if defined(__GNUC__) && !defined(__clang__)
 #pragma GCC diagnostic ignored "-Wpsabi"
-#endif
 
 namespace Mp {
 
