@@ -16,7 +16,8 @@ fail() {
 sheets() {
   LC_ALL=C "$program" "$@" "$samples/space.json" "$tests/comp_odd.json"
 }
-sheets | sed '2,/^Frame/{/^Frame/!d}' >"$work/sheets"
+# Of layers that differ in their numbers only one is enough here.
+sheets | sed '2,/^Frame/{/^Frame/!d}; /^Layer "\(Edge\|Behind\|Empty\|Halved\|Too long\)"/,/^$/d' >"$work/sheets"
 diff "$tests/comp_sheets.txt" "$work/sheets" || fail "< the sheets as they should be, > as they are"
 # The same as JSON, here with a line for each layer, and with numbers from the platform's sine rounded.
 sheets --json | tr -d '\n' | perl -pe 's/ +/ /g; s/\{ "name"/\n$&/g;
