@@ -76,6 +76,11 @@ TEST(Mtrx, StepsAreAppended) {
   EXPECT_EQ(BitsOf(m), BitsOf(odd));
   EXPECT_EQ(M_TranslateMatrix(&m, 0, 0), 0);
   EXPECT_TRUE(std::isnan(m.m[2][0]));
+  // None is what is as good as neutral.
+  EXPECT_EQ(M_ScaleMatrix(&(m = odd), 1, 1 + 0x1p-52, 0, 0), 0);
+  EXPECT_NE(m.m[1][1], 4);
+  EXPECT_EQ(M_RotateMatrix(&(m = odd), 1e-13, 0, 0), 0);
+  EXPECT_NE(m.m[1][1], 4);
 }
 
 TEST(Mtrx, KindsAndEquality) {

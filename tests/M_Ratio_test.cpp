@@ -268,10 +268,10 @@ TEST(Ratio, ConvertedToAnotherDenominator) {
     if (kind == 8) newDen = in.den * (word % 9);
     if (kind == 7) in.den = 0;
     if (kind == 6) in = {in.num < 0 ? -1 : 1, in.den % 2 + 1};  // At the ends of what fits.
-    if (kind == 5) {  // A half, but for what is rounded on the way.
+    if (kind == 5 || kind == 4) {  // A half, but for what is rounded on the way.
       newDen = 1;
-      in.den = in.den % 1000 + 1;
-      in = {(in.num % 1000 | 1) * Cut(in.den), 2 * in.den};
+      const uint32_t n = word % 997 + 1;
+      in = {(in.num % 1000 | 1) * Cut(n), 2 * n};
     }
     const bool isZero = newDen == 0 || in.den == 0;
     const double value = newDen == in.den ? in.num : newDen * 1.0 / in.den * in.num;
