@@ -89,6 +89,14 @@ TEST(MtrxPlane, LinesAreCutAtTheNearPlane) {
     M_Clip3DLine(&p, &q, &both, &both, &crossing);
     Equal(both, (flags[0] | flags[1]));
   });
+  // A NaN is neither before the plane nor behind it: the first point is the one that is cut.
+  const V3 seen = {0, 0, 1}, none = {0, 0, kNan};
+  V3 crossing;
+  for (const auto& [p, q] : {std::pair(seen, none), {none, seen}}) {
+    unsigned char flags[2] = {9, 9};
+    M_Clip3DLine(&p, &q, &flags[0], &flags[1], &crossing);
+    EXPECT_TRUE(flags[0] == 1 && flags[1] == 0);
+  }
 }
 
 TEST(MtrxPlane, LinesAreCutToRectangles) {
@@ -161,6 +169,11 @@ TEST(MtrxPlane, Directions) {
     Check(IsNear(q.x, centre.x + h * c - v * s, 1e-5L));
     Check(IsNear(q.y, centre.y + h * s + v * c, 1e-5L));
   });
+  // Narrowed before the centre is added.
+  const F2 centre = {1, 1};
+  F2 q = {0x1p-30f, 1};
+  M_TransformPtF(&centre, 0, &q);
+  EXPECT_EQ(q.x, 0);
 }
 
 }  // namespace

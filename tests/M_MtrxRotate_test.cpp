@@ -129,6 +129,11 @@ TEST(MtrxRotate, SlerpKeepsTheSpeed) {
     // The shorter way round, and beyond 0 ... 1 further.
     Check(IsNear(at, part(1 - t) * p + (dot < 0 ? -part(t) : part(t)) * q));
   });
+  // At a right angle as given.
+  const V4 p = {1, 0, 0, 0}, q = {0, 1, 0, 0};
+  V4 at;
+  M_Slerp(&p.x, &q.x, &at.x, 0.5);
+  EXPECT_TRUE(at.x > 0 && at.y > 0);
   // All four as good as equal: the first, whatever t is.
   Holds([](bool isNear) {
     const auto p = DrawUnit<V4>();
