@@ -130,10 +130,10 @@ TEST(MtrxRotate, SlerpKeepsTheSpeed) {
     Check(IsNear(at, part(1 - t) * p + (dot < 0 ? -part(t) : part(t)) * q));
   });
   // At a right angle as given.
-  const V4 p = {1, 0, 0, 0}, q = {0, 1, 0, 0};
-  V4 at;
-  M_Slerp(&p.x, &q.x, &at.x, 0.5);
-  EXPECT_TRUE(at.x > 0 && at.y > 0);
+  const V4 first = {1, 0, 0, 0}, second = {0, 1, 0, 0};
+  V4 middle;
+  M_Slerp(&first.x, &second.x, &middle.x, 0.5);
+  EXPECT_TRUE(middle.x > 0 && middle.y > 0);
   // All four as good as equal: the first, whatever t is.
   Holds([](bool isNear) {
     const auto p = DrawUnit<V4>();

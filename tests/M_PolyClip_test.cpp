@@ -83,9 +83,9 @@ TEST(PolyClip, Limits) {
   const Polygon along = {{1, 0.25e-6, 1, 0}, {2, 0.25000005e-6, 2, 0}, {2, 3, 3, 0}};
   EXPECT_EQ(Text({Clip(kSquare, along).at(1)}), Text({along[0]}));
   // So small that it is turned round, or not.
-  for (const auto& [size, count] : {std::pair(1.2e-3, 0u), {2e-3, 4}}) {
-    const Polygon small = {{0, 0, 0, 0}, {0, size, 0, 0}, {size, size, 0, 0}, {size, 0, 0, 0}};
-    EXPECT_EQ(Clip(small, kSquare).size(), count) << size;
+  for (const auto& [width, count] : {std::pair(2e-6, 0u), {std::nextafter(2e-6, 1), 4}}) {
+    const Polygon small = {{0, 0, 0, 0}, {0, 1, 0, 0}, {width, 1, 0, 0}, {width, 0, 0, 0}};
+    EXPECT_EQ(Clip(small, kSquare).size(), count) << width;
   }
 }
 
