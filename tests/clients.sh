@@ -16,6 +16,7 @@ fail() {
   exit 1
 }
 
+echo '#include "M_Ops.h"' >"$work/ops.cpp"
 for header in M_Utils.h M_Rect.h M_Matrix.h M_CMatrixImpl.h U.h XLOG.h qelcore/geom/PointT.h; do
   echo "#include \"$header\"" | tee -a "$work/all.cpp" | g++ -std=c++17 $flags -fsyntax-only -xc++ - || fail "$header alone"
 done
@@ -52,6 +53,7 @@ int main() {
 }
 END
 for compiler in $compilers; do
+  $compiler -std=c++20 $flags -fsyntax-only "$work/ops.cpp" || fail "$compiler: M_Ops.h alone"
   for standard in c++17 c++20 c++2b 'c++17 -fno-exceptions -fno-rtti'; do
     $compiler -std=$standard $flags "$work/all.cpp" -o "$work/all" -L"$library" -Wl,-rpath,"$library" -lM -lMHost ||
       fail "$compiler -std=$standard"

@@ -6,7 +6,7 @@ source=$2
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
-# The functions and objects that headers declare at the beginning of a line, in C.
+# The functions and objects that headers declare at the beginning of a line, in C; M_Ops.h has none.
 declared() {
   sed -nE -e '/EqualMatrixWithinEpsilon|GetMatrix3DeterminantPlus|TransformPoint3DtoScreen/d' \
     -e '/IsFloatPointInConcavePoly|GetMinimumEdgeDistance|IsConvex|ComputeConvexHull/d' \
@@ -16,7 +16,7 @@ declared() {
 # Members and overloads are listed one by one in the linker's script, as they are written in C++;
 # instances of templates over iterators have the standard library's names: how many of each.
 {
-  declared "$source"/include/*.h | sed 's/$/@@M_1/'
+  declared "$source"/include/M_[!O]*.h | sed 's/$/@@M_1/'
   declared "$source"/src/pkg/M/indep/Mp_*.h | sed 's/$/@@M_PRIVATE/'
   sed -nE 's/^ +"(.+)";$/\1@@M_1/p' "$source"/src/pkg/M/linux/M.map
   printf '%s\n' '6 bool M_IsConvex' '8 void M_ComputeConvexHull'

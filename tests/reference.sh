@@ -4,9 +4,9 @@
 set -eu
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
-flags='-std=c++17 -Wall -Wextra -Wpedantic -Werror'
+flags='-std=c++20 -Wall -Wextra -Wpedantic -Werror'
 # What the headers need of the standard library is read once for all of them.
-printf '#include <%s>\n' cstddef cstdint exception iterator type_traits utility vector >"$work/std.h"
+printf '#include <%s>\n' algorithm cstddef cstdint exception functional iostream iterator optional span utility vector >"$work/std.h"
 "$3" $flags -x c++-header "$work/std.h" -o "$work/std.h.gch"
 for example in "$1"/examples/reference/*.cpp; do
   "$3" $flags -include "$work/std.h" -isystem "$1/include" -isystem "$1/host/include" "$example" -o "$work/example" \
