@@ -105,6 +105,9 @@ std::vector<V2> DrawSet() {
     const V2& p = shapes[shape];
     points[i] = {p.x + middle.x, p.y * flat + p.x * slope + middle.y};
   }
+  // Neighbours together, so that whole blocks lie inside.
+  if (*rc::gen::arbitrary<bool>())
+    std::sort(points.begin(), points.end(), [](const V2& p, const V2& q) { return p.y < q.y; });
   const auto far = *rc::gen::inRange(0, 4) > 0
                        ? rc::gen::element(0.0, 0.0, 2e9, -1e9)
                        : rc::gen::element(0.0, kNan, kInf, -kInf, 1e308, -1e308);
