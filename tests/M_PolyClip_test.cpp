@@ -86,6 +86,8 @@ TEST(PolyClip, Limits) {
   for (const auto& [width, count] : {std::pair(2e-6, 0u), {std::nextafter(2e-6, 1), 4}}) {
     const Polygon small = {{0, 0, 0, 0}, {0, 1, 0, 0}, {width, 1, 0, 0}, {width, 0, 0, 0}};
     EXPECT_EQ(Clip(small, kSquare).size(), count) << width;
+    const Polygon low = {{1, 0, 0, 0}, {0, 0, 0, 0}, {0, width, 0, 0}, {1, width, 0, 0}};
+    EXPECT_EQ(Clip(low, kSquare).size(), count) << width;
   }
 }
 

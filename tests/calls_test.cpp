@@ -148,6 +148,9 @@ void TestOutputs(const Function& f) {
   for (size_t k = 0; k < f.parameters.size(); ++k) {
     const Parameter& p = f.parameters[k];
     if (p.isOutput && !p.isInOut) std::memset(others[k].bytes, 0x5A, sizeof(Room));
+    const size_t end = p.type->size * p.targets;
+    Expect(std::memcmp(values[k].bytes + end, given[k].bytes + end, sizeof(Room) - end) == 0, f,
+           given, "something is written behind an output");
     if (!p.isOutput) {
       Expect(std::memcmp(&values[k], &given[k], p.type->size) == 0, f, given,
              "an input is changed");

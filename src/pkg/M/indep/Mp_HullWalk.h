@@ -49,7 +49,6 @@ inline size_t HullOfLine(const std::array<Key, 4>& ends, Key* hull) {
 inline size_t Hull(Key* sorted, size_t count, Key* scratch) {
   const Key first = sorted[0];
   const Key last = sorted[count - 1];
-  if (first == last) return 1;
   const std::array<Key, 4> ends = {first, sorted[1], sorted[count - 2], last};
   // Those below the line from the first to the last stay, those above go to the end of the scratch,
   // from right to left.
