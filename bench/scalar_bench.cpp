@@ -10,7 +10,7 @@
 #include <vector>
 
 #include "Comparison.h"
-#include "M_Utils.h"
+#include "M_Ops.h"
 #include "Random.h"
 
 #ifdef BENCH_HAS_BOOST
@@ -172,6 +172,10 @@ void RatioArithmetic() {
     return order;
   };
   Line("add, clocks", "M", clocks, add);
+  // Beside the call that they are.
+  Line("a + b", "M", times, [](const auto& p) { return p.first + p.second; });
+  Line("a + b", "M_AddRatio", times, add);
+  Line("frame at", "M", clocks, [](const auto& p) { return M_FrameAt(p.first, p.second); });
   Line("compare", "M", times, compare);
   Line("compare, clocks", "M", clocks, compare);
   Line("compare, wide", "M", wide, compare);

@@ -88,8 +88,9 @@ std::vector<Shape> MakeShapes(const Composition& composition, const Sheet& sheet
   for (size_t i = composition.layers.size(); i-- > 0;) {
     const Layer& layer = composition.layers[i];
     const Row& row = sheet.rows[i];
-    const bool isOn = !options.frame || (row.in.frames.count <= *options.frame &&
-                                         *options.frame < row.out.frames.count);
+    const auto frameOf = [](const Time& time) { return static_cast<double>(time.frames.count); };
+    const bool isOn =
+        !options.frame || (frameOf(row.in) <= *options.frame && *options.frame < frameOf(row.out));
     if (!isOn || (!layer.placement && !layer.space)) continue;
     Shape shape =
         layer.space ? MakeSolid(layer, scene, *composition.size, options) : MakeFlat(layer);

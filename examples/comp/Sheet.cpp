@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <numeric>
 
+#include "M_Ops.h"
+
 namespace comp {
 namespace {
 
@@ -36,9 +38,8 @@ Value Add(const Value& a, const Value& b) {
 
 class SheetMaker {
  public:
-  explicit SheetMaker(const Composition& composition)
-      : composition_(composition), frameRate_{composition.frameRate.ratio, Accuracy::kExact} {
-    M_RecipRatio(&frameRate_.ratio, &frame_.ratio, nullptr);
+  explicit SheetMaker(const Composition& composition) : composition_(composition) {
+    M_RecipRatio(&composition.frameRate.ratio, &frame_.ratio, nullptr);
     start_ = Calculate(M_MulRatio, Units(composition.start), frame_);
     duration_ = Calculate(M_MulRatio, Units(composition.duration), frame_);
   }
@@ -70,13 +71,13 @@ class SheetMaker {
   static Value Units(int32_t count) { return {{count, 1}, Accuracy::kExact}; }
 
   Time InFrames(const Value& seconds) const {
-    const Value frames = Calculate(M_MulRatio, seconds, frameRate_);
-    if (frames.accuracy == Accuracy::kOverflow) return {seconds, {0, false, true}};
-    // A whole number rounded from a ratio has no more bits than its numerator.
-    M_Ratio whole;
-    unsigned char isExact;
-    M_ConvRatio(&frames.ratio, 1, &whole, &isExact, nullptr);
-    return {seconds, {whole.num, isExact && frames.accuracy == Accuracy::kExact, false}};
+    if (seconds.accuracy == Accuracy::kOverflow) return {seconds, {0, false, true}};
+    const auto frame = [&](M_Rounding rounding) {
+      return M_FrameAt(seconds.ratio, composition_.frameRate.ratio, rounding);
+    };
+    const bool isWhole = frame(M_Rounding::Floor) == frame(M_Rounding::Ceiling);
+    const bool isExact = isWhole && seconds.accuracy != Accuracy::kApproximated;
+    return {seconds, {frame(M_Rounding::Nearest), isExact, false}};
   }
 
   // Both ends are held to the composition by themselves: M_ClipSpanToSpan would end every layer
@@ -117,7 +118,6 @@ class SheetMaker {
   }
 
   const Composition& composition_;
-  Value frameRate_;
   Value frame_ = {{}, Accuracy::kExact};
   Value start_;
   Value duration_;

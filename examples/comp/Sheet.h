@@ -28,9 +28,9 @@ struct Value {
   Accuracy accuracy;
 };
 
-/// A time in whole frames of the composition.
+/// The frame of the composition that is nearest to a time, and whether it begins just then.
 struct Frames {
-  int32_t count;
+  int64_t count;
   bool isExact;
   bool hasOverflowed;
 };
