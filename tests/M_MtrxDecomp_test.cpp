@@ -102,10 +102,12 @@ TEST(MtrxDecomp, GimbalLock) {
   EXPECT_EQ(M_DecomposeMatrix4(&flat, &d, nullptr), 0);
   EXPECT_EQ(BitsOf(d.scale), BitsOf(V3{0, 2, 2}));
   // A length that is so small that rounding makes a sine of more than 1 of it.
-  const M_Matrix4 tiny = {{{0, 0, 2.7e-162, 0}, {0, 1, 0, 0}, {2.7e-162, 0, 0, 0}, {0, 0, 0, 1}}};
-  for (const auto decompose : kBoth) {
-    decompose(&tiny, &d, nullptr);
-    EXPECT_EQ(std::abs(d.rotate.y), kPi / 2);
+  for (const double t : {2.7e-162, -2.7e-162}) {
+    const M_Matrix4 tiny = {{{0, 0, t, 0}, {0, 1, 0, 0}, {t, 0, 0, 0}, {0, 0, 0, 1}}};
+    for (const auto decompose : kBoth) {
+      decompose(&tiny, &d, nullptr);
+      EXPECT_EQ(std::abs(d.rotate.y), kPi / 2);
+    }
   }
 }
 
