@@ -104,14 +104,6 @@ using Operation = int32_t(const M_Ratio*, const M_Ratio*, M_Ratio*, unsigned cha
                       &out, nullptr)};
 }
 
-// The library's result, if it has an exact one.
-inline std::optional<M_Ratio> Ask(Operation* operation, const M_Ratio& a, const M_Ratio& b) {
-  M_Ratio out;
-  unsigned char status = 0;
-  if (const int32_t code = operation(&a, &b, &out, &status)) throw int{code};
-  return status == 0 ? std::optional(out) : std::nullopt;
-}
-
 // Reports and throws what an operation does for a zero denominator.
 [[noreturn]] inline void FailZeroDenominator(Operation* operation) {
   const M_Ratio none = {1, 0}, one = {1, 1};
@@ -119,17 +111,28 @@ inline std::optional<M_Ratio> Ask(Operation* operation, const M_Ratio& a, const 
   throw int{(operation == M_DivRatio ? M_MulRatio : operation)(&none, &one, &out, nullptr)};
 }
 
-// An operation by the library, if it is asked and knows, else exactly.
-constexpr M_Ratio Calculate(Operation* operation, bool isAsked, const M_Ratio& a, const M_Ratio& b,
-                            const auto& exactly) {
-  if (!std::is_constant_evaluated() && isAsked) {
-    if (const std::optional<M_Ratio> ratio = Ask(operation, a, b)) return *ratio;
-  }
+using Exactly = Exact(const M_Ratio&, const M_Ratio&);
+
+constexpr M_Ratio CalculateExactly(Operation* operation, const M_Ratio& a, const M_Ratio& b,
+                                   Exactly* exactly) {
   const Exact exact = exactly(a, b);
   if (exact.den == 0 || b.den == 0) FailZeroDenominator(operation);
   const std::optional<M_Ratio> ratio = exact.ToRatio();
   if (!ratio) FailAs(operation);
   return *ratio;
+}
+
+// An operation by the library, if it is to be asked and knows, else exactly.
+constexpr M_Ratio Calculate(Operation* operation, bool isAsked, const M_Ratio& a, const M_Ratio& b,
+                            Exactly* exactly) {
+  if (!std::is_constant_evaluated() && isAsked) {
+    M_Ratio out;
+    unsigned char status = 0;
+    const int32_t code = operation(&a, &b, &out, &status);
+    if ((code | status) == 0) return out;
+    if (code != 0) throw int{code};
+  }
+  return CalculateExactly(operation, a, b, exactly);
 }
 
 inline void ThrowOnError(int32_t code) {

@@ -1,6 +1,7 @@
 #include "M_Utils.h"
 
 #include <bit>
+#include <cstring>
 
 #include "Mp_Arith.h"
 #include "Mp_Bits.h"
@@ -84,6 +85,16 @@ bool Cancel(int32_t* num, uint32_t* den) {
 
 bool Cancel(M_Ratio* r) { return Cancel(&r->num, &r->den); }
 
+// Writes a ratio in one piece: who copies it at once would have to wait for two.
+[[gnu::always_inline]] inline void Put(int32_t num, uint32_t den, M_Ratio* out) {
+  const uint64_t first =
+      std::endian::native == std::endian::little ? static_cast<uint32_t>(num) : den;
+  const uint64_t second =
+      std::endian::native == std::endian::little ? den : static_cast<uint32_t>(num);
+  const uint64_t both = second << 32 | first;
+  std::memcpy(out, &both, sizeof both);
+}
+
 // What has 15 bits can be multiplied and its products added in 32 without asking further.
 bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
   constexpr uint32_t kSmall = 0x8000;
@@ -95,7 +106,7 @@ bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
 [[gnu::always_inline]] inline bool TrySum(M_Ratio a, M_Ratio b, bool subtract, M_Ratio* sum) {
   const int32_t bNum = subtract ? Mp::WrapNegate(b.num) : b.num;
   if (a.num == 0) {
-    *sum = {bNum, b.den};
+    Put(bNum, b.den, sum);
     return true;
   }
   if (b.num == 0) {
@@ -104,7 +115,7 @@ bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
   }
   if (a.den == b.den) {
     if (Mp::AddWouldOverflow(a.num, bNum)) return false;
-    *sum = {Mp::WrapAdd(a.num, bNum), a.den};
+    Put(Mp::WrapAdd(a.num, bNum), a.den, sum);
     return true;
   }
   uint32_t gcd;
@@ -127,13 +138,13 @@ bool AreSmall(const M_Ratio& a, const M_Ratio& b) {
                     Mp::AddWouldOverflow(aTerm, bTerm))) {
     return false;
   }
-  *sum = {Mp::WrapAdd(aTerm, bTerm), aFactor * a.den};
+  Put(Mp::WrapAdd(aTerm, bTerm), aFactor * a.den, sum);
   return true;
 }
 
 [[gnu::always_inline]] inline bool TryProduct(M_Ratio a, M_Ratio b, M_Ratio* product) {
   if (Mp::UMulWouldOverflow(a.den, b.den) || Mp::MulWouldOverflow(a.num, b.num)) return false;
-  *product = {Mp::WrapMul(a.num, b.num), a.den * b.den};
+  Put(Mp::WrapMul(a.num, b.num), a.den * b.den, product);
   return true;
 }
 
