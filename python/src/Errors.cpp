@@ -5,6 +5,7 @@
 #include <string>
 #include <utility>
 
+#include "M_Rect.h"
 #include "M_Utils.h"
 #include "U.h"
 
@@ -45,7 +46,10 @@ void Raise(int code) {
 
 void TranslateErrors() {
   U_SetReportCallback(
-      [](void*, const U_Report* report) { kept = {report->id, report->text}; }, nullptr);
+      [](void*, const U_Report* report) {
+        kept = {report->id, report->text};
+      },
+      nullptr);
   py::register_exception_translator([](std::exception_ptr thrown) {
     try {
       if (thrown) std::rethrow_exception(thrown);

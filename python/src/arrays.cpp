@@ -17,8 +17,6 @@ using V3 = M_Vector3T<double>;
 using V4 = M_Vector4T<double>;
 using F2 = M_Vector2T<float>;
 
-bool Is(const py::array& array, const char* dtype) { return array.dtype().is(py::dtype(dtype)); }
-
 py::ssize_t Columns(const py::array& array) { return array.ndim() == 2 ? array.shape(1) : 0; }
 
 template <class Record, class Number, class Matrix>

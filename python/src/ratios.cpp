@@ -16,8 +16,7 @@ namespace py = pybind11;
 
 // Kept as long as the process.
 const py::object& Fraction() {
-  static const auto* const type =
-      new py::object(py::module_::import("fractions").attr("Fraction"));
+  static const auto* const type = new py::object(py::module_::import("fractions").attr("Fraction"));
   return *type;
 }
 
@@ -54,7 +53,8 @@ bool IsWhole(const py::handle& value) { return PyIndex_Check(value.ptr()) != 0; 
 // A whole number or a Fraction as it is, or nothing for what is neither.
 std::optional<M_Ratio> Convert(const py::handle& value) {
   if (py::isinstance<M_Ratio>(value)) return value.cast<M_Ratio>();
-  if (IsWhole(value)) return FromParts(py::int_(py::reinterpret_borrow<py::object>(value)), py::int_(1));
+  if (IsWhole(value))
+    return FromParts(py::int_(py::reinterpret_borrow<py::object>(value)), py::int_(1));
   if (!py::isinstance(value, Fraction())) return {};
   return FromParts(value.attr("numerator"), value.attr("denominator"));
 }
@@ -69,7 +69,8 @@ M_Ratio Parse(const std::string& text) {
 M_Ratio Given(const py::handle& value) {
   if (py::isinstance<py::str>(value)) return Parse(value.cast<std::string>());
   if (const auto ratio = Convert(value)) return *ratio;
-  throw py::type_error("a Ratio, int, Fraction or str is needed; Ratio.approximate() takes a float");
+  throw py::type_error(
+      "a Ratio, int, Fraction or str is needed; Ratio.approximate() takes a float");
 }
 
 // As Python's own numbers of the same value.
@@ -99,28 +100,35 @@ py::object NotImplemented() { return py::reinterpret_borrow<py::object>(Py_NotIm
 template <class Class, class Operator>
 void DefineOperator(Class& c, const std::string& name, const char* doc, Operator calculate) {
   c.def(("__" + name + "__").c_str(), calculate, py::arg("other"), doc);
-  c.def(("__" + name + "__").c_str(), [calculate](const M_Ratio& a, const py::object& b) {
-    const auto other = Convert(b);
-    return other ? py::cast(calculate(a, *other)) : NotImplemented();
-  }, py::arg("other"));
-  c.def(("__r" + name + "__").c_str(), [calculate](const M_Ratio& a, const py::object& b) {
-    const auto other = Convert(b);
-    return other ? py::cast(calculate(*other, a)) : NotImplemented();
-  }, py::arg("other"));
+  c.def(("__" + name + "__").c_str(),
+        [calculate](const M_Ratio& a, const py::object& b) {
+          const auto other = Convert(b);
+          return other ? py::cast(calculate(a, *other)) : NotImplemented();
+        },
+        py::arg("other"));
+  c.def(("__r" + name + "__").c_str(),
+        [calculate](const M_Ratio& a, const py::object& b) {
+          const auto other = Convert(b);
+          return other ? py::cast(calculate(*other, a)) : NotImplemented();
+        },
+        py::arg("other"));
 }
 
 template <class Class, class Operator>
 void DefineComparison(Class& c, const char* name, int operation, Operator compare) {
   c.def(name, compare, py::arg("other"));
-  c.def(name, [operation](const M_Ratio& a, const py::object& b) {
-    // Also numbers that are larger than any ratio.
-    if (!IsWhole(b) && !py::isinstance<py::float_>(b) && !py::isinstance(b, Fraction())) {
-      return NotImplemented();
-    }
-    PyObject* const result = PyObject_RichCompare(ToFraction(a).ptr(), b.ptr(), operation);
-    if (!result) throw py::error_already_set();
-    return py::reinterpret_steal<py::object>(result);
-  }, py::arg("other"));
+  c.def(
+      name,
+      [operation](const M_Ratio& a, const py::object& b) {
+        // Also numbers that are larger than any ratio.
+        if (!IsWhole(b) && !py::isinstance<py::float_>(b) && !py::isinstance(b, Fraction())) {
+          return NotImplemented();
+        }
+        PyObject* const result = PyObject_RichCompare(ToFraction(a).ptr(), b.ptr(), operation);
+        if (!result) throw py::error_already_set();
+        return py::reinterpret_steal<py::object>(result);
+      },
+      py::arg("other"));
 }
 
 M_Rounding ToRounding(const std::string& name) {
@@ -144,27 +152,28 @@ void BindRatios(py::module_& m) {
         "From an int, a Fraction, a Ratio, or a str such as '30000/1001', '25' or '23.976'.")
       .def(py::init([](const py::int_& num, const py::int_& den) { return FromParts(num, den); }),
            py::arg("num"), py::arg("den"), "num / den as it stands; den must not be 0.")
-      .def_static("approximate",
-                  [](double value) {
-                    M_Ratio ratio;
-                    unsigned char isOutOfRange;
-                    M_FpLong2Ratio(&ratio, &isOutOfRange, value);
-                    if (isOutOfRange) M_OpsDetail::FailAs(M_MulRatio);
-                    const bool isExact =
-                        std::fma(value, static_cast<double>(ratio.den), -1.0 * ratio.num) == 0;
-                    return py::make_tuple(ratio, isExact);
-                  },
-                  py::arg("value"),
-                  "The best ratio near a float, as single precision sees it, up to 2**30, and "
-                  "whether it is exactly the float.\n\n"
-                  ">>> Ratio.approximate(12.5)\n(Ratio(25, 2), True)\n"
-                  ">>> Ratio.approximate(0.1)\n(Ratio(1, 10), False)")
+      .def_static(
+          "approximate",
+          [](double value) {
+            M_Ratio ratio;
+            unsigned char isOutOfRange;
+            M_FpLong2Ratio(&ratio, &isOutOfRange, value);
+            if (isOutOfRange) M_OpsDetail::FailAs(M_MulRatio);
+            const bool isExact =
+                std::fma(value, static_cast<double>(ratio.den), -1.0 * ratio.num) == 0;
+            return py::make_tuple(ratio, isExact);
+          },
+          py::arg("value"),
+          "The best ratio near a float, as single precision sees it, up to 2**30, and "
+          "whether it is exactly the float.\n\n"
+          ">>> Ratio.approximate(12.5)\n(Ratio(25, 2), True)\n"
+          ">>> Ratio.approximate(0.1)\n(Ratio(1, 10), False)")
       .def_readonly("num", &M_Ratio::num, "As it stands; carries the sign.")
       .def_readonly("den", &M_Ratio::den, "As it stands; above 0.")
-      .def_property_readonly("numerator", [](const M_Ratio& r) { return Lowest(r).num; },
-                             "In lowest terms.")
-      .def_property_readonly("denominator", [](const M_Ratio& r) { return Lowest(r).den; },
-                             "In lowest terms.")
+      .def_property_readonly(
+          "numerator", [](const M_Ratio& r) { return Lowest(r).num; }, "In lowest terms.")
+      .def_property_readonly(
+          "denominator", [](const M_Ratio& r) { return Lowest(r).den; }, "In lowest terms.")
       .def("reduced", &Lowest, "The same in lowest terms.")
       .def("as_fraction", &ToFraction, "The same as a fractions.Fraction.")
       .def("__repr__",
@@ -195,26 +204,29 @@ void BindRatios(py::module_& m) {
   DefineComparison(c, "__gt__", Py_GT, [](R a, R b) { return a > b; });
   DefineComparison(c, "__ge__", Py_GE, [](R a, R b) { return a >= b; });
 
-  m.def("frame_at",
-        [](const py::object& time, const py::object& rate, const std::string& rounding) {
-          return M_FrameAt(Given(time), Given(rate), ToRounding(rounding));
-        },
-        py::arg("time"), py::arg("rate"), py::arg("rounding") = "floor",
-        "The frame at a time in seconds, exactly; the rate is in frames a second.\n\n"
-        ">>> frame_at(7200, '30000/1001')\n215784\n"
-        ">>> frame_at('0.5', 25, 'nearest')\n13");
-  m.def("time_of_frame",
-        [](int64_t frame, const py::object& rate) { return M_TimeOfFrame(frame, Given(rate)); },
-        py::arg("frame"), py::arg("rate"),
-        "When a frame begins, in seconds, exactly.\n\n"
-        ">>> time_of_frame(100, '30000/1001')\nRatio(1001, 300)");
-  m.def("snap_to_frame",
-        [](const py::object& time, const py::object& rate, const std::string& rounding) {
-          return M_SnapToFrame(Given(time), Given(rate), ToRounding(rounding));
-        },
-        py::arg("time"), py::arg("rate"), py::arg("rounding") = "floor",
-        "The beginning of the frame at a time.\n\n"
-        ">>> snap_to_frame(Ratio(1, 3), 24)\nRatio(1, 3)");
+  m.def(
+      "frame_at",
+      [](const py::object& time, const py::object& rate, const std::string& rounding) {
+        return M_FrameAt(Given(time), Given(rate), ToRounding(rounding));
+      },
+      py::arg("time"), py::arg("rate"), py::arg("rounding") = "floor",
+      "The frame at a time in seconds, exactly; the rate is in frames a second.\n\n"
+      ">>> frame_at(7200, '30000/1001')\n215784\n"
+      ">>> frame_at('0.5', 25, 'nearest')\n13");
+  m.def(
+      "time_of_frame",
+      [](int64_t frame, const py::object& rate) { return M_TimeOfFrame(frame, Given(rate)); },
+      py::arg("frame"), py::arg("rate"),
+      "When a frame begins, in seconds, exactly.\n\n"
+      ">>> time_of_frame(100, '30000/1001')\nRatio(1001, 300)");
+  m.def(
+      "snap_to_frame",
+      [](const py::object& time, const py::object& rate, const std::string& rounding) {
+        return M_SnapToFrame(Given(time), Given(rate), ToRounding(rounding));
+      },
+      py::arg("time"), py::arg("rate"), py::arg("rounding") = "floor",
+      "The beginning of the frame at a time.\n\n"
+      ">>> snap_to_frame(Ratio(1, 3), 24)\nRatio(1, 3)");
 }
 
 }  // namespace m_math
