@@ -5,7 +5,8 @@ set -eu
 cd "$(dirname "$0")"
 . scripts/common.sh
 
-need_packages g++ cmake ninja-build gettext pkg-config debhelper lintian doxygen doxygen-awesome-css
+need_packages g++ cmake ninja-build gettext pkg-config debhelper lintian doxygen doxygen-awesome-css dh-python \
+  pybind11-dev python3-dev python3-numpy
 packages=build/packages
 rm -rf $packages
 mkdir -p $packages/source
@@ -57,6 +58,8 @@ gdb -nx -batch -ex 'break M_AddRatio' -ex run -ex up -ex 'print frame' -ex 'prin
 grep -F '$1 = 1001/30000 = ' "$work/log" || fail "gdb does not show a ratio as one writes it."
 grep -F '$2 = 240' "$work/log" || fail "gdb does not know M_TransformPoly3D."
 [ -s /usr/share/doc/libm-math-dev/html/index.html ] && [ -s /usr/share/doc/libm-math-dev/README.md.gz ] || fail "The documents are not there."
+echo "In Python:"
+(cd "$work" && /usr/bin/python3 -c 'import m_math; print(m_math.frame_at(7200, "30000/1001"), m_math.__file__)') || fail "m_math does not work."
 remove || fail "The packages cannot be removed."
 # What is left are folders that others have files in.
 while read -r file; do [ ! -f "$file" ] || fail "$file is left."; done <"$work/files"

@@ -63,7 +63,36 @@ from ._types import Decomposition
 
 _numbers.Rational.register(Ratio)
 
-__all__ = [name for name in dir() if not name.startswith("_")]
+__all__ = [
+    "Decomposition",
+    "DivisionError",
+    "Error",
+    "FixedPoint",
+    "FixedRect",
+    "FloatPoint",
+    "FloatRect",
+    "LPoint",
+    "LRect",
+    "Matrix3",
+    "Matrix4",
+    "NoMemoryError",
+    "OperandError",
+    "Point",
+    "RangeError",
+    "Ratio",
+    "Rect",
+    "TransformPoly2D",
+    "TransformPoly3D",
+    "clip_polygon",
+    "convex_hull",
+    "frame_at",
+    "points_in_polygon",
+    "polygon_area",
+    "slerp",
+    "snap_to_frame",
+    "time_of_frame",
+    "transform",
+]
 
-for _name in __all__:
+for _name in set(__all__) - {"Ratio"}:
     globals()[_name].__module__ = __name__

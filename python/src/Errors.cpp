@@ -35,14 +35,14 @@ const char* NameOf(int code) {
   }
 }
 
-void Raise(int code) {
+}  // namespace
+
+void SetError(int code) {
   const Kept report = std::exchange(kept, {});
   const py::object type = py::module_::import("m_math._errors").attr(NameOf(code));
   const std::string text = report.text.empty() ? "out of range" : report.text;
   PyErr_SetObject(type.ptr(), type(text, code, report.id & 0xFFFF).ptr());
 }
-
-}  // namespace
 
 void TranslateErrors() {
   U_SetReportCallback(
@@ -54,7 +54,7 @@ void TranslateErrors() {
     try {
       if (thrown) std::rethrow_exception(thrown);
     } catch (int code) {
-      Raise(code);
+      SetError(code);
     }
   });
 }

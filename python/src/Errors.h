@@ -11,6 +11,9 @@ namespace m_math {
 /// Check() does, becomes one of `m_math._errors`.
 void TranslateErrors();
 
+/// Sets the exception of a code, and of the report that was kept.
+void SetError(int code);
+
 /// Throws a code that is none of success.
 inline void Check(int32_t code) {
   if (code != 0) throw int{code};

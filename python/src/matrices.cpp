@@ -76,6 +76,13 @@ py::class_<Matrix> BindMatrix(py::module_& m, const char* name, const char* doc)
         return py::buffer_info(&matrix.m[0][0], step, py::format_descriptor<double>::format(), 2,
                                {kRows, kRows}, {kRows * step, step}, true);
       })
+      .def("__array__",
+           [](const py::object& self) {
+             const auto& matrix = self.cast<const Matrix&>();
+             py::array_t<double> array({kSize<Matrix>, kSize<Matrix>}, &matrix.m[0][0], self);
+             array.attr("setflags")(py::arg("write") = false);
+             return array;
+           })
       .def(
           "__matmul__", [](const Matrix& a, const Matrix& b) { return a * b; }, py::is_operator(),
           "What does as self does, and then as the other does: points are rows.")
@@ -228,7 +235,10 @@ void BindMatrices(py::module_& m) {
             return M_LookAtMatrix(ToVector(eye), ToVector(target), ToVector(up));
           },
           py::arg("eye"), py::arg("target"), py::arg("up"),
-          "What takes the world to an eye that looks at a target.");
+          "The orientation of an eye that looks at a target: it takes directions as the eye has "
+          "them "
+          "to those of the world. A camera is Matrix4().translate(-x, -y, -z) @ "
+          "look_at(...).transposed() for an eye at (x, y, z).");
   m.def(
       "slerp",
       [](const py::sequence& a, const py::sequence& b, double t) {
