@@ -7,6 +7,7 @@ python_package() {
   (
     export PYTHONPATH="$PWD/build/python/python" MYPYPATH="$PWD/build/python/python" PYTHONDONTWRITEBYTECODE=1
     /usr/bin/python3 -m pytest -q -p no:cacheprovider tests/python
+    for page in README.md docs/python.md; do /usr/bin/python3 -m doctest $page; done
     cd build/python
     /usr/bin/python3 -m mypy.stubtest m_math --concise --allowlist ../../python/stubtest_allowlist.txt
   )
