@@ -38,7 +38,7 @@ need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libr
   binutils clang clang-format clang-tidy abigail-tools gdb perl
 
 echo "Checking the format ..."
-find include src host examples tests bench fuzz python -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror
+find include src host comp examples tests bench fuzz python -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror
 
 for preset in $presets; do
   build_preset "$preset"
@@ -49,7 +49,7 @@ for preset in $presets; do
     find src host -name '*.cpp' | xargs -n 1 -P 2 \
       clang-tidy --quiet --warnings-as-errors='*' -p "build/$preset" 2>/dev/null
     # Following every path through a reader of JSON takes longer than all else.
-    find examples/comp examples/digest -name '*.cpp' | xargs -n 1 -P 2 \
+    find comp examples/digest -name '*.cpp' | xargs -n 1 -P 2 \
       clang-tidy --quiet --warnings-as-errors='*' --checks='-clang-analyzer-*' -p "build/$preset" 2>/dev/null
   fi
 done

@@ -7,11 +7,11 @@ cd "$(dirname "$0")"
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev librapidcheck-dev libbenchmark-dev pkg-config
 build_preset release --target comp M_catalogues
 echo
-build/release/bin/comp examples/comp/samples/film.json examples/comp/samples/broadcast.json \
-  examples/comp/samples/sound.json examples/comp/samples/stage.json examples/comp/samples/space.json
+build/release/bin/comp comp/samples/film.json comp/samples/broadcast.json \
+  comp/samples/sound.json comp/samples/stage.json comp/samples/space.json
 
 for sample in stage space; do
-  build/release/bin/comp --svg build/$sample.svg --grid 24 examples/comp/samples/$sample.json 2>/dev/null
+  build/release/bin/comp --svg build/$sample.svg --grid 24 comp/samples/$sample.json 2>/dev/null
 done
 echo
 echo "Drawn: build/stage.svg, build/space.svg"

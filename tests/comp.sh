@@ -3,7 +3,7 @@
 # Usage: comp.sh PROGRAM SOURCE_FOLDER
 set -eu
 program=$1
-samples=$2/examples/comp/samples
+samples=$2/comp/samples
 tests=$2/tests
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT

@@ -7,13 +7,16 @@
 #include <cstdlib>
 #include <fstream>
 #include <iostream>
+#include <sstream>
 #include <string>
 #include <vector>
 
 #include "Composition.h"
 #include "M_Utils.h"
+#include "Otio.h"
 #include "Picture.h"
 #include "SheetText.h"
+#include "TimelineText.h"
 #include "U.h"
 #include "Wording.h"
 
@@ -21,7 +24,7 @@ namespace {
 
 constexpr int kBadInput = 2;
 
-constexpr char kHelp[] = R"(Usage: comp [--json] FILE...
+constexpr char kHelp[] = R"(Usage: comp [--json] [--drop-frame] FILE...
        comp --svg OUT [--time FRAME] [--hit X,Y] [--tolerance D] [--grid N] FILE
 
 Prints the sheet of each composition file: its frame rate, start and duration,
@@ -32,8 +35,13 @@ matrix places each of them, its corners, the pixels it touches, those in the
 frame and those above each layer below it; and for layers in space how they are
 moved, scaled, sheared and turned, and where the camera sees them.
 
-  --json  prints the sheet as JSON
-  --help  prints this text
+Of a timeline of OpenTimelineIO (.otio) it prints what is where in each track:
+record and source times as timecode, and how long everything is, exactly.
+A FILE of - is the standard input.
+
+  --json        prints the sheet as JSON
+  --drop-frame  timecode of 29.97 and 59.94 drops frames
+  --help        prints this text
 
 With --svg a composition with a size is drawn instead: the frame, the outline of
 every layer, filled from back to front, with a dashed line around its part in
@@ -47,8 +55,8 @@ the frame, layers seen from the side as a line, and the hull of them all.
 
 A composition file is a JSON object:
   name       text
-  frameRate  frames a second: "24000/1001", 25, or a decimal such as 23.976,
-             which is approximated
+  frameRate  frames a second: "24000/1001", 25, or a decimal: 23.976, 29.97
+             and their like stand for thousands over 1001
   start      first frame
   duration   number of frames
   size       width and height of the frame in pixels, [1920, 1080]; may be left
@@ -79,29 +87,48 @@ if an argument or a file cannot be used. The library's own reports are part of
 the sheet, in the language of the environment.
 )";
 
+// A whole file; "-" is the standard input.
+std::string ReadText(const std::string& fileName) {
+  std::ostringstream text;
+  std::ifstream file;
+  if (fileName != "-") file.open(fileName);
+  std::istream& in = fileName == "-" ? std::cin : file;
+  if (!(text << in.rdbuf()) && !in.eof()) throw comp::InputError(fileName + ": cannot be read.");
+  return text.str();
+}
+
 comp::Composition ReadFile(const std::string& fileName) {
-  std::ifstream file(fileName);
-  if (!file) throw comp::InputError(fileName + ": cannot be read.");
-  return comp::ReadComposition(file, fileName);
+  std::istringstream text(ReadText(fileName));
+  return comp::ReadComposition(text, fileName);
 }
 
 // The sheets of all files, complete before anything is printed.
-std::string MakeSheets(const std::vector<std::string>& fileNames, bool asJson) {
-  std::string text;
-  for (const std::string& fileName : fileNames) {
-    const comp::Sheet sheet = comp::MakeSheet(ReadFile(fileName));
-    if (!asJson && !text.empty()) text += '\n';
-    text += asJson ? comp::ToJson(sheet) : comp::ToTable(sheet);
-  }
-  return text;
-}
-
 struct Arguments {
   bool asJson = false;
-  std::string svg;  ///< The file to draw to, if any.
+  bool mayDrop = false;  ///< Timecode of 29.97 and 59.94 drops frames.
+  std::string svg;       ///< The file to draw to, if any.
   comp::PictureOptions picture;
   std::vector<std::string> fileNames;
 };
+
+// The sheets of all files, complete before anything is printed.
+std::string MakeSheets(const Arguments& arguments) {
+  std::string text;
+  for (const std::string& fileName : arguments.fileNames) {
+    const std::string file = ReadText(fileName);
+    if (!arguments.asJson && !text.empty()) text += '\n';
+    if (comp::IsOtio(file)) {
+      const auto timelines = comp::ReadOtio(file, fileName);
+      text += arguments.asJson ? comp::ToJson(timelines, arguments.mayDrop)
+                               : comp::ToTable(timelines, arguments.mayDrop);
+      continue;
+    }
+    std::istringstream stream(file);
+    const comp::Sheet sheet = comp::MakeSheet(comp::ReadComposition(stream, fileName));
+    text += arguments.asJson ? comp::ToJson(sheet) : comp::ToTable(sheet);
+  }
+  return text;
+}
 
 // One or more numbers with commas between them, and nothing else.
 std::vector<double> ParseNumbers(const std::string& option, const std::string& text, size_t count) {
@@ -149,7 +176,9 @@ Arguments ParseArguments(const std::vector<std::string>& words) {
       if (!(points >= 1 && points <= 1000))
         throw comp::InputError("--grid takes 1 to 1000 points.");
       arguments.picture.grid = static_cast<int>(points);
-    } else if (word.starts_with("-")) {
+    } else if (word == "--drop-frame") {
+      arguments.mayDrop = true;
+    } else if (word.starts_with("-") && word != "-") {
       throw comp::InputError(word + " is not an option; see comp --help.");
     } else {
       arguments.fileNames.push_back(word);
@@ -200,9 +229,7 @@ int main(int argc, char** argv) {
   int status = 0;
   try {
     const Arguments arguments = ParseArguments(words);
-    const std::string text = arguments.svg.empty()
-                                 ? MakeSheets(arguments.fileNames, arguments.asJson)
-                                 : MakePicture(arguments);
+    const std::string text = arguments.svg.empty() ? MakeSheets(arguments) : MakePicture(arguments);
     if (!(std::cout << text << std::flush)) {
       std::cerr << "comp: the output cannot be written.\n";
       status = EXIT_FAILURE;

@@ -7,6 +7,8 @@
 #include <nlohmann/json.hpp>
 #include <optional>
 
+#include "Rates.h"
+
 namespace comp {
 namespace {
 
@@ -140,19 +142,10 @@ class Fields {
     const auto value = Parse<double>(text);
     if (!value || !std::isfinite(*value)) ComplainAbout(field, "\"" + text + "\" is not a number");
     if (*value <= 0) ComplainAbout(field, text + " is not greater than zero");
-    M_Ratio ratio;
-    M_FpLong2Ratio(&ratio, nullptr, *value);
-    // 0/0 for what is too large, 0/1 for what is too small.
-    if (ratio.num == 0) ComplainAbout(field, text + " is out of range");
-    if (isFrameRate) {
-      // 23.976, 29.97 and their like stand for thousands over 1001, which differ by a millionth.
-      const int32_t nominal = M_RoundDouble(*value * 1.001);
-      const double broadcast = nominal * 1000.0 / 1001.0;
-      if (nominal < 1000 && std::abs(*value - broadcast) < 1.5e-6 * *value) {
-        ratio = {nominal * 1000, 1001};
-      }
-    }
-    return {ratio, ratio.num / static_cast<double>(ratio.den) == *value ? "" : text};
+    const auto decimal = ToRatio(text, isFrameRate);
+    // 0 for what is too small.
+    if (!decimal || decimal->ratio.num == 0) ComplainAbout(field, text + " is out of range");
+    return {decimal->ratio, decimal->isExact ? "" : text};
   }
 
   const Json& json_;

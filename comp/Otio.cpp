@@ -1,0 +1,293 @@
+#include "Otio.h"
+
+#include <algorithm>
+#include <cctype>
+#include <cmath>
+#include <cstdlib>
+#include <nlohmann/json.hpp>
+#include <optional>
+
+#include "Composition.h"
+#include "M_Ops.h"
+#include "Rates.h"
+
+namespace comp {
+namespace {
+
+using Json = nlohmann::json;
+
+// Writers put Infinity, NaN and numbers beyond a double into their metadata, which JSON has not:
+// they become null. The rest stays, byte by byte.
+std::string WithoutOddNumbers(const std::string& text) {
+  std::string plain;
+  plain.reserve(text.size());
+  for (size_t i = 0; i < text.size();) {
+    const char c = text[i];
+    size_t end = i + 1;
+    if (c == '"') {
+      while (end < text.size() && text[end] != '"') end += text[end] == '\\' ? 2 : 1;
+      end = std::min(end + 1, text.size());
+      plain.append(text, i, end - i);
+    } else if (c == '-' || std::isalnum(static_cast<unsigned char>(c))) {
+      const auto isPart = [](char part) {
+        return std::isalnum(static_cast<unsigned char>(part)) || part == '.' || part == '+' ||
+               part == '-';
+      };
+      while (end < text.size() && isPart(text[end])) ++end;
+      const std::string token = text.substr(i, end - i);
+      const bool isName = token.find_first_of("IN") != std::string::npos;
+      const bool isTooLarge = !isName && token.size() > 3 && token != "true" && token != "false" &&
+                              token != "null" && std::isinf(std::strtod(token.c_str(), nullptr));
+      plain += isName || isTooLarge ? "null" : token;
+    } else {
+      plain += c;
+    }
+    i = end;
+  }
+  return plain;
+}
+
+// A span of a medium, or of a track.
+struct Range {
+  Seconds start, duration;
+};
+
+class Reader {
+ public:
+  explicit Reader(const std::string& fileName) : fileName_(fileName) {}
+
+  std::vector<Timeline> Read(const Json& root) {
+    std::vector<Timeline> timelines;
+    if (IsA(root, "SerializableCollection")) {
+      for (const Json& child : List(root, "children")) {
+        if (IsA(child, "Timeline")) timelines.push_back(ReadTimeline(child));
+      }
+    } else if (IsA(root, "Timeline")) {
+      timelines.push_back(ReadTimeline(root));
+    } else if (IsA(root, "Stack") || IsItem(root) || IsA(root, "Track")) {
+      timelines.push_back(ReadTracks(root, root));
+    }
+    if (timelines.empty()) throw InputError(fileName_ + ": there is no timeline in it.");
+    return timelines;
+  }
+
+ private:
+  // Whether an object's schema has this name, in any version.
+  static bool IsA(const Json& json, const std::string& name) {
+    if (!json.is_object() || !json.contains("OTIO_SCHEMA")) return false;
+    const Json& schema = json["OTIO_SCHEMA"];
+    if (!schema.is_string()) return false;
+    const std::string text = schema;
+    return text.substr(0, text.find('.')) == name;
+  }
+
+  static bool IsItem(const Json& json) {
+    return IsA(json, "Clip") || IsA(json, "Gap") || IsA(json, "Filler");
+  }
+  static bool IsTrack(const Json& json) { return IsA(json, "Track") || IsA(json, "Sequence"); }
+
+  static const Json& Get(const Json& json, const char* field) {
+    static const Json none;
+    return json.is_object() && json.contains(field) ? json[field] : none;
+  }
+  static const Json& List(const Json& json, const char* field) {
+    static const Json none = Json::array();
+    const Json& list = Get(json, field);
+    return list.is_array() ? list : none;
+  }
+  static std::string Name(const Json& json) {
+    const Json& name = Get(json, "name");
+    return name.is_string() ? name.get<std::string>() : std::string();
+  }
+
+  void Remark(const std::string& text) {
+    auto& remarks = timeline_.remarks;
+    if (std::find(remarks.begin(), remarks.end(), text) == remarks.end()) remarks.push_back(text);
+  }
+
+  std::optional<M_Ratio> Rate(const Json& time) {
+    const Json& rate = Get(time, "rate");
+    if (!rate.is_number()) return {};
+    const auto ratio = ToRatio(rate.dump(), true);
+    if (!ratio || ratio->ratio.num <= 0) return {};
+    if (!ratio->isExact)
+      Remark("the rate " + rate.dump() + " is no ratio of 32 bits: the nearest is taken");
+    return ratio->ratio;
+  }
+
+  // value / rate.
+  std::optional<Seconds> Time(const Json& time) {
+    const Json& value = Get(time, "value");
+    const auto rate = Rate(time);
+    if (!value.is_number() || !rate) return {};
+    const auto count = ToRatio(value.dump(), false);
+    if (!count) {
+      Remark("the time " + value.dump() + " does not fit");
+      return Seconds{{0, 0}, false};
+    }
+    const M_Ratio frame = {static_cast<int32_t>(rate->den), static_cast<uint32_t>(rate->num)};
+    return Seconds{count->ratio, count->isExact} * frame;
+  }
+
+  std::optional<Range> ReadRange(const Json& range) {
+    const auto duration = Time(Get(range, "duration"));
+    if (!duration) return {};
+    const auto start = Time(Get(range, "start_time"));
+    return Range{start.value_or(Seconds()), *duration};
+  }
+
+  // The medium that a clip shows: the one that is chosen, of several.
+  static const Json& Medium(const Json& clip) {
+    const Json& several = Get(clip, "media_references");
+    const Json& key = Get(clip, "active_media_reference_key");
+    if (several.is_object())
+      return Get(several, key.is_string() ? key.get<std::string>().c_str() : "DEFAULT_MEDIA");
+    return Get(clip, "media_reference");
+  }
+
+  // What of an item is seen: its source range or, without one, all there is.
+  Range Trimmed(const Json& item) {
+    if (const auto given = ReadRange(Get(item, "source_range"))) return *given;
+    if (IsA(item, "Clip")) {
+      if (const auto available = ReadRange(Get(Medium(item), "available_range"))) return *available;
+      Remark("\"" + Name(item) + "\" does not say how long it is");
+      return {};
+    }
+    if (IsA(item, "Timeline")) return Trimmed(Get(item, "tracks"));
+    Range all;
+    for (const Json& child : List(item, "children")) {
+      if (IsA(child, "Transition")) continue;
+      const Seconds duration = Trimmed(child).duration;
+      if (IsA(item, "Stack")) {
+        if (all.duration < duration) all.duration = duration;
+      } else {
+        all.duration = all.duration + duration;
+      }
+    }
+    return all;
+  }
+
+  M_Ratio Speed(const Json& item) {
+    M_Ratio speed = {1, 1};
+    for (const Json& effect : List(item, "effects")) {
+      if (IsA(effect, "FreezeFrame")) {
+        speed = {0, 1};
+      } else if (IsA(effect, "LinearTimeWarp")) {
+        const Json& scalar = Get(effect, "time_scalar");
+        const auto factor = ToRatio(scalar.is_number() ? scalar.dump() : "", false);
+        const Seconds product = Seconds{speed, true} * (factor ? factor->ratio : M_Ratio{1, 1});
+        if (!factor || !factor->isExact || !product.isExact) {
+          Remark("the speed of \"" + Name(item) + "\" is not exact");
+        }
+        if (product.IsKnown()) speed = product.ratio;
+      } else if (!IsA(effect, "Effect") && !Get(effect, "OTIO_SCHEMA").is_null()) {
+        Remark("an effect " + Get(effect, "OTIO_SCHEMA").dump() + " is passed over");
+      }
+    }
+    return speed;
+  }
+
+  Track ReadTrack(const Json& json) {
+    Track track;
+    track.name = Name(json);
+    const Json& kind = Get(json, "kind");
+    track.kind = kind.is_string() ? kind.get<std::string>() : "Video";
+    // Of a trimmed track, what is in the trim.
+    const auto trim = ReadRange(Get(json, "source_range"));
+    Seconds at = Seconds() - (trim ? trim->start : Seconds());
+    for (const Json& child : List(json, "children")) {
+      if (IsA(child, "Transition")) {
+        const Seconds in = Time(Get(child, "in_offset")).value_or(Seconds());
+        const Seconds out = Time(Get(child, "out_offset")).value_or(Seconds());
+        track.items.push_back(
+            {Item::Kind::kTransition, Name(child), at - in, at + out, Seconds() - in, out, {1, 1}});
+        continue;
+      }
+      const bool isNested = IsA(child, "Stack") || IsTrack(child) || IsA(child, "Timeline");
+      if (!IsItem(child) && !isNested) {
+        Remark("an object " + Get(child, "OTIO_SCHEMA").dump() + " is passed over");
+        continue;
+      }
+      const Range range = Trimmed(child);
+      const M_Ratio speed = Speed(child);
+      const Item::Kind itemKind = isNested             ? Item::Kind::kStack
+                                  : IsA(child, "Clip") ? Item::Kind::kClip
+                                                       : Item::Kind::kGap;
+      track.items.push_back({itemKind, Name(child), at, at + range.duration, range.start,
+                             range.start + range.duration * speed, speed});
+      at = at + range.duration;
+    }
+    track.duration = trim ? trim->duration : at;
+    return track;
+  }
+
+  // The first rate that is met.
+  std::optional<M_Ratio> FindRate(const Json& json) {
+    if (IsA(json, "RationalTime")) return Rate(json);
+    if (json.is_object()) {
+      for (const char* field : {"source_range", "available_range", "start_time", "duration",
+                                "media_reference", "media_references", "tracks", "children"}) {
+        if (const auto rate = FindRate(Get(json, field))) return rate;
+      }
+      if (!json.contains("OTIO_SCHEMA")) {
+        for (const Json& value : json) {
+          if (const auto rate = FindRate(value)) return rate;
+        }
+      }
+    }
+    if (json.is_array()) {
+      for (const Json& child : json) {
+        if (const auto rate = FindRate(child)) return rate;
+      }
+    }
+    return {};
+  }
+
+  Timeline ReadTimeline(const Json& json) { return ReadTracks(json, Get(json, "tracks")); }
+
+  Timeline ReadTracks(const Json& json, const Json& tracks) {
+    timeline_ = {};
+    timeline_.name = Name(json);
+    const Json& start = Get(json, "global_start_time");
+    timeline_.start = Time(start).value_or(Seconds());
+    const auto rate = Rate(start);
+    const auto met = rate ? rate : FindRate(tracks);
+    timeline_.rate = met.value_or(M_Ratio{24, 1});
+    if (!met) Remark("no rate is given: 24 frames a second are taken");
+    const auto add = [&](const Json& child) {
+      timeline_.tracks.push_back(ReadTrack(child));
+      const Seconds& duration = timeline_.tracks.back().duration;
+      if (timeline_.duration < duration) timeline_.duration = duration;
+    };
+    if (IsTrack(tracks)) {
+      add(tracks);
+    } else if (IsItem(tracks)) {
+      add({{"children", Json::array({tracks})}});
+    } else {
+      for (const Json& child : List(tracks, "children")) {
+        // What stands in the stack by itself is a track of its own.
+        if (IsTrack(child)) {
+          add(child);
+        } else {
+          add({{"name", Name(child)}, {"children", Json::array({child})}});
+        }
+      }
+    }
+    return std::move(timeline_);
+  }
+
+  const std::string& fileName_;
+  Timeline timeline_;
+};
+
+}  // namespace
+
+bool IsOtio(const std::string& text) { return text.find("\"OTIO_SCHEMA\"") != std::string::npos; }
+
+std::vector<Timeline> ReadOtio(const std::string& text, const std::string& fileName) {
+  const Json root = Json::parse(WithoutOddNumbers(text), nullptr, false);
+  if (root.is_discarded()) throw InputError(fileName + ": is not JSON, or ends too soon.");
+  return Reader(fileName).Read(root);
+}
+
+}  // namespace comp

@@ -1,0 +1,119 @@
+// What comp reads, and how it counts.
+
+#include <gtest/gtest.h>
+
+#include <cstdio>
+
+#include "Composition.h"
+#include "M_Ops.h"
+#include "Otio.h"
+#include "Rates.h"
+#include "Timecode.h"
+
+namespace {
+
+using comp::Seconds;
+
+TEST(Timecode, DropsTwoOrFourNumbersOfEachMinuteButTheTenth) {
+  for (const M_Ratio rate : {M_Ratio{30000, 1001}, {60000, 1001}}) {
+    const int base = rate.num / 1000;
+    int64_t frame = 0;
+    for (int number = 0; number < 86400 * base; ++number) {  // A day, number by number.
+      const int second = number / base, minute = second / 60, f = number % base;
+      const bool isLeftOut = minute % 10 != 0 && second % 60 == 0 && f < base / 15;
+      char text[40];
+      std::snprintf(text, sizeof text, "%02d:%02d:%02d;%02d", minute / 60, minute % 60, second % 60,
+                    f);
+      const auto parsed = comp::ParseTimecode(text, rate);
+      ASSERT_EQ(parsed.has_value(), !isLeftOut) << text;
+      if (isLeftOut) continue;
+      ASSERT_EQ(*parsed, frame) << text;
+      ASSERT_EQ(comp::ToTimecode(frame++, rate, true), text);
+    }
+  }
+  const M_Ratio film = {24000, 1001};
+  EXPECT_EQ(comp::ToTimecode(-25, film, false), "-00:00:01:01");
+  EXPECT_EQ(comp::ParseTimecode("-100:00:00:23", film), -(100 * 3600 * 24 + 23));
+  for (const char* bad :
+       {"", "1:2:3", "00:00:00:24", "00:60:00:00", "00:00:00;01", "00:00:00:", "a"}) {
+    EXPECT_FALSE(comp::ParseTimecode(bad, film)) << bad;
+  }
+  EXPECT_TRUE(comp::MayDrop({60000, 1001}) && !comp::MayDrop(film));
+}
+
+TEST(Rates, AreWhatDecimalsStandFor) {
+  const std::tuple<const char*, M_Ratio, bool> rows[] = {
+      {"23.976", {24000, 1001}, true},
+      {"23.98", {24000, 1001}, true},
+      {"23.976023976024", {24000, 1001}, true},
+      {"59.94", {60000, 1001}, true},
+      {"119.88", {120000, 1001}, true},
+      {"12.5", {25, 2}, true},
+      {"24.0", {24, 1}, true},
+      {"23.97", {2397, 100}, true},
+      {"1.25e-3", {1, 800}, true},
+      {"-0.8545454545454545", {-47, 55}, true},
+      {"3.14159265358979", {13176795, 4194304}, false}};
+  for (const auto& [text, ratio, isExact] : rows) {
+    const auto read = comp::ToRatio(text, true);
+    EXPECT_TRUE(read && read->ratio == ratio && read->isExact == isExact) << text;
+  }
+  EXPECT_EQ(comp::ToRatio("23.976", false)->ratio, (M_Ratio{2997, 125}));
+  for (const char* bad : {"", "x", "1e40", "nan", "1 "})
+    EXPECT_FALSE(comp::ToRatio(bad, true)) << bad;
+}
+
+std::string RationalTime(const std::string& value, const std::string& rate) {
+  return R"({"OTIO_SCHEMA": "RationalTime.1", "value": )" + value + R"(, "rate": )" + rate + "}";
+}
+std::string Range(const std::string& start, const std::string& duration, const std::string& rate) {
+  return R"({"OTIO_SCHEMA": "TimeRange.1", "start_time": )" + RationalTime(start, rate) +
+         R"(, "duration": )" + RationalTime(duration, rate) + "}";
+}
+
+TEST(Otio, TracksAreSummedExactly) {
+  const std::string text =
+      R"({"OTIO_SCHEMA": "Timeline.1", "name": "T", "metadata": {"a": -Infinity, "b": [NaN, Inf],
+          "c": 123456789012345678901234567890, "d": 1e999, "e": "Inf \" NaN"},
+          "global_start_time": )" +
+      RationalTime("86400", "23.976") + R"(, "tracks": {"OTIO_SCHEMA":
+          "Stack.1", "children": [{"OTIO_SCHEMA": "Sequence.1", "kind": "Video", "children": [
+            {"OTIO_SCHEMA": "Clip.2", "name": "a", "source_range": )" +
+      Range("10", "48", "23.98") + R"(,
+             "effects": [{"OTIO_SCHEMA": "LinearTimeWarp.1", "time_scalar": 0.3333333333333333}]},
+            {"OTIO_SCHEMA": "Transition.1", "in_offset": )" +
+      RationalTime("12", "24") + R"(,
+             "out_offset": )" +
+      RationalTime("6", "24") + R"(},
+            {"OTIO_SCHEMA": "Clip.2", "name": "b", "active_media_reference_key": "hi", "media_references":
+             {"hi": {"OTIO_SCHEMA": "ExternalReference.1", "available_range": )" +
+      Range("0", "88200.5", "44100") + R"(}}},
+            {"OTIO_SCHEMA": "Marker.2"},
+            {"OTIO_SCHEMA": "Stack.1", "children": [{"OTIO_SCHEMA": "Gap.1", "source_range": )" +
+      Range("0", "3", "25") + R"(},
+             {"OTIO_SCHEMA": "Gap.1", "source_range": )" +
+      Range("0", "5", "25") + R"(}]}]}]}})";
+  ASSERT_TRUE(comp::IsOtio(text));
+  const comp::Timeline timeline = comp::ReadOtio(text, "file").at(0);
+  EXPECT_EQ(timeline.rate, (M_Ratio{24000, 1001}));
+  EXPECT_EQ(timeline.start.ratio, (M_Ratio{18018, 5}));
+  ASSERT_EQ(timeline.tracks.size(), 1u);
+  const auto& items = timeline.tracks[0].items;
+  ASSERT_EQ(items.size(), 4u);
+  const M_Ratio first = {2002, 1000}, second = {176401, 88200};
+  EXPECT_EQ(items[0].recordOut.ratio, first);
+  EXPECT_EQ(items[0].sourceOut.ratio, (M_Ratio{10 * 1001, 24000} + first / M_Ratio{3, 1}));
+  EXPECT_EQ(items[1].recordIn.ratio, (first - M_Ratio{1, 2}));
+  EXPECT_EQ(items[1].recordOut.ratio, (first + M_Ratio{1, 4}));
+  EXPECT_EQ(items[2].recordOut.ratio, (first + second));
+  EXPECT_EQ(timeline.duration.ratio, (first + second + M_Ratio{1, 5}));
+  EXPECT_TRUE(timeline.duration.isExact && items[3].kind == comp::Item::Kind::kStack);
+  EXPECT_EQ(timeline.remarks.size(), 1u);
+  // What is cut off is no file, what has no timeline none of these.
+  for (size_t size = 40; size < text.size(); size += 97) {
+    EXPECT_THROW(comp::ReadOtio(text.substr(0, size), "file"), comp::InputError);
+  }
+  EXPECT_THROW(comp::ReadOtio(R"({"OTIO_SCHEMA": "Marker.2"})", "file"), comp::InputError);
+}
+
+}  // namespace
