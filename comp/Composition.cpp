@@ -1,11 +1,14 @@
 #include "Composition.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cmath>
 #include <initializer_list>
 #include <istream>
+#include <iterator>
 #include <nlohmann/json.hpp>
 #include <optional>
+#include <set>
 
 #include "Rates.h"
 
@@ -273,33 +276,77 @@ Layer ReadLayer(const Json& json, const std::string& fileName, size_t number,
   return layer;
 }
 
+// Follows the parser, so that it can be said where the file stopped making sense, and refuses
+// keys that come twice.
+class Parser : public nlohmann::detail::json_sax_dom_parser<Json> {
+ public:
+  using Base = nlohmann::detail::json_sax_dom_parser<Json>;
+
+  explicit Parser(Json* json) : Base(*json, false) {}
+
+  bool start_object(std::size_t size) {
+    keys_.emplace_back();
+    if (keys_.size() == 2 && isInList_) {
+      ++layer;
+      field.clear();
+    }
+    return Base::start_object(size);
+  }
+  bool end_object() {
+    keys_.pop_back();
+    return Base::end_object();
+  }
+  bool start_array(std::size_t size) {
+    if (keys_.size() == 1) isInList_ = true;
+    return Base::start_array(size);
+  }
+  bool key(std::string& name) {
+    field = name;
+    if (!keys_.back().insert(name).second) return Complain("comes twice");
+    return Base::key(name);
+  }
+  template <class Error>
+  bool parse_error(std::size_t at, const std::string&, const Error& error) {
+    byte = at - std::min<size_t>(at, 1);
+    return Complain(error.id == 406 ? "a number is too large" : "is not JSON, or ends too soon");
+  }
+
+  std::string complaint;  // Empty unless something is wrong.
+  std::string field;      // The last key.
+  size_t layer = 0;       // Its number, or 0 before the first.
+  size_t byte = 0;        // Where the file stopped making sense.
+
+ private:
+  bool Complain(const std::string& what) {
+    complaint = what;
+    return false;
+  }
+
+  std::vector<std::set<std::string>> keys_;
+  bool isInList_ = false;
+};
+
+// " (line 2, column 1)", for what is not the beginning.
+std::string Place(const std::string& text, size_t byte) {
+  if (byte == 0) return {};
+  const std::string_view before = std::string_view(text).substr(0, byte);
+  const auto lines = std::count(before.begin(), before.end(), '\n');
+  const size_t column = before.size() - (lines == 0 ? 0 : before.rfind('\n') + 1);
+  return " (line " + std::to_string(lines + 1) + ", column " + std::to_string(column + 1) + ")";
+}
+
 }  // namespace
 
 Composition ReadComposition(std::istream& in, const std::string& fileName) {
-  // Follows the parser, so that it can be said where the file stopped making sense.
-  size_t layerNumber = 0;
-  std::string field;
-  const auto follow = [&](int depth, Json::parse_event_t event, Json& parsed) {
-    if (event == Json::parse_event_t::object_start && depth == 2) {
-      ++layerNumber;
-      field.clear();
-    }
-    if (event == Json::parse_event_t::key) field = parsed;
-    return true;
-  };
-  const auto complain = [&](const std::string& what) {
-    std::string place =
-        layerNumber == 0 ? ": composition" : ": layer " + std::to_string(layerNumber);
-    if (!field.empty()) place += ", at or behind field \"" + field + "\"";
-    throw InputError(fileName + place + ": " + what + ".");
-  };
+  const std::string text(std::istreambuf_iterator<char>(in), {});
   Json json;
-  try {
-    json = Json::parse(in, follow);
-  } catch (const Json::parse_error& error) {
-    complain("is not JSON, or ends too soon (at byte " + std::to_string(error.byte) + ")");
-  } catch (const Json::out_of_range&) {
-    complain("a number is too large");
+  Parser parser(&json);
+  Json::sax_parse(text, &parser);
+  if (!parser.complaint.empty()) {
+    std::string place =
+        parser.layer == 0 ? ": composition" : ": layer " + std::to_string(parser.layer);
+    if (!parser.field.empty()) place += ", at or behind field \"" + parser.field + "\"";
+    throw InputError(fileName + place + ": " + parser.complaint + Place(text, parser.byte) + ".");
   }
   const Fields fields(json, fileName + ": composition",
                       {"name", "frameRate", "start", "duration", "size", "camera", "layers"});
