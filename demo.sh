@@ -8,10 +8,11 @@ need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev libr
 build_preset release --target comp M_catalogues
 echo
 build/release/bin/comp comp/samples/film.json comp/samples/broadcast.json \
-  comp/samples/sound.json comp/samples/stage.json comp/samples/space.json
+  comp/samples/sound.json comp/samples/stage.json comp/samples/space.json comp/samples/harbour.otio
 
 for sample in stage space; do
   build/release/bin/comp --svg build/$sample.svg --grid 24 comp/samples/$sample.json 2>/dev/null
 done
+build/release/bin/comp --svg build/harbour.svg --drop-frame comp/samples/harbour.otio
 echo
-echo "Drawn: build/stage.svg, build/space.svg"
+echo "Drawn: build/stage.svg, build/space.svg, build/harbour.svg"

@@ -42,7 +42,7 @@ Json ToJson(const Size& size) { return {size.width, size.height}; }
 std::string ToTable(const Layout& layout) {
   std::string text = "Frame " + ToText(layout.frame) + ", layers from the top down\n";
   for (const PlacedLayer& layer : layout.layers) {
-    text += "\nLayer \"" + layer.name + "\", " + ToText(layer.size) + ", placed by " +
+    text += "\nLayer \"" + Printable(layer.name) + "\", " + ToText(layer.size) + ", placed by " +
             Name(layer.matrixType) + (layer.isInvertible ? "\n" : ", which cannot be undone\n");
     std::string corners;
     for (const auto& corner : layer.corners) {
@@ -52,7 +52,7 @@ std::string ToTable(const Layout& layout) {
     text += Line("pixels", ToText(layer.bounds));
     text += Line("in frame", ToText(layer.inFrame));
     for (const Overlap& overlap : layer.overlaps) {
-      text += Line("over \"" + overlap.name + "\"", ToText(overlap.rect));
+      text += Line("over \"" + Printable(overlap.name) + "\"", ToText(overlap.rect));
     }
   }
   return text + "\nAll layers: " + ToText(layout.all) + "\n";

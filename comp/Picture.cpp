@@ -1,6 +1,7 @@
 #include "Picture.h"
 
 #include <algorithm>
+#include <cmath>
 #include <cstdio>
 #include <iterator>
 #include <utility>
@@ -116,20 +117,6 @@ const char* Color(size_t number) {
   return kColors[number % std::size(kColors)];
 }
 
-std::string Escaped(const std::string& text) {
-  std::string escaped;
-  for (const char c : text) {
-    if (c == '&') {
-      escaped += "&amp;";
-    } else if (c == '<') {
-      escaped += "&lt;";
-    } else {
-      escaped += c;
-    }
-  }
-  return escaped;
-}
-
 template <class Points>
 std::string PointList(const Points& points) {
   std::string text;
@@ -140,8 +127,9 @@ std::string PointList(const Points& points) {
 }
 
 template <class Points>
-std::string Polygon(const Points& points, const std::string& style) {
-  return std::string("<polygon points=\"").append(PointList(points)).append("\" ") + style + "/>\n";
+std::string Polygon(const Points& points, const std::string& style, const std::string& title) {
+  if (points.empty()) return "";
+  return "<polygon points=\"" + PointList(points) + "\" " + style + ">" + title + "</polygon>\n";
 }
 
 std::string Dot(const Point& p, double radius, const std::string& style) {
@@ -149,36 +137,93 @@ std::string Dot(const Point& p, double radius, const std::string& style) {
          "\" r=\"" + ToText(radius) + "\" " + style + "/>\n";
 }
 
-std::string DrawShape(const Shape& shape) {
-  const std::string color = Color(shape.number);
-  std::string svg;
-  if (shape.isEdgeOn) {
-    svg += "<polyline points=\"" + PointList(shape.outline) + "\" fill=\"none\" stroke=\"" + color +
-           "\" stroke-width=\"3\"/>\n";
-  } else {
-    svg += Polygon(shape.outline, "fill=\"" + color + "\" fill-opacity=\"0.6\" stroke=\"" + color +
-                                      "\" stroke-width=\"2\"");
+using Homogeneous = std::vector<M_Vector4T<double>>;
+
+// The part of an outline in a box; nothing where it is not finite.
+Homogeneous Clipped(const std::vector<Point>& outline, const M_FloatRect& box) {
+  Homogeneous part;
+  for (const Point& p : outline) {
+    if (!std::isfinite(p.x) || !std::isfinite(p.y)) return {};
+    part.push_back({p.x, p.y, 0, 1});
   }
-  return svg;
+  const Homogeneous clipper = {{box.left, box.top, 0, 1},
+                               {box.right, box.top, 0, 1},
+                               {box.right, box.bottom, 0, 1},
+                               {box.left, box.bottom, 0, 1}};
+  M_PolyPolyClip2D(&clipper, &part, &part);
+  return part;
 }
 
+std::string Title(const std::string& name) { return "<title>" + Escaped(name) + "</title>"; }
+
+// What is outside the picture is cut off: renderers have limits of their own.
+std::string DrawShape(const Shape& shape, const M_FloatRect& box) {
+  const std::string color = Color(shape.number);
+  if (!shape.isEdgeOn) {
+    return Polygon(
+        Clipped(shape.outline, box),
+        "fill=\"" + color + "\" fill-opacity=\"0.6\" stroke=\"" + color + "\" stroke-width=\"2\"",
+        Title(shape.name));
+  }
+  std::vector<Point> line;
+  for (const Point& p : shape.outline) {
+    line.push_back({std::clamp(p.x, box.left, box.right), std::clamp(p.y, box.top, box.bottom)});
+  }
+  return "<polyline points=\"" + PointList(line) + "\" fill=\"none\" stroke=\"" + color +
+         "\" stroke-width=\"3\">" + Title(shape.name) + "</polyline>\n";
+}
+
+// Places names so that none lies on another: in the middle, or as near above or below as there is
+// room; else not at all.
+class Labels {
+ public:
+  explicit Labels(double size) : size_(size) {}
+
+  std::string Place(const std::string& name, const Point& middle) {
+    const auto letters = std::count_if(name.begin(), name.end(), [](char c) {
+      return (static_cast<unsigned char>(c) & 0xC0) != 0x80;
+    });
+    const double half = 0.3 * size_ * static_cast<double>(letters);
+    for (const int step : {0, 1, -1, 2, -2, 3, -3}) {
+      const double y = middle.y + step * size_ * 1.2;
+      const M_FloatRect box = {middle.x - half, y - size_, middle.x + half, y + 0.3 * size_};
+      const auto overlaps = [&](const M_FloatRect& other) {
+        return M_SectFloatRect(&box, &other, nullptr) != 0;
+      };
+      if (std::any_of(placed_.begin(), placed_.end(), overlaps)) continue;
+      placed_.push_back(box);
+      return "<text x=\"" + ToText(middle.x) + "\" y=\"" + ToText(y) + "\">" + Escaped(name) +
+             "</text>\n";
+    }
+    return "";
+  }
+
+ private:
+  double size_;
+  std::vector<M_FloatRect> placed_;
+};
+
 // The part of an outline inside the frame with a dashed edge, and the name in its middle.
-std::string DrawInFrame(const Shape& shape, const Size& frame) {
-  const double width = frame.width;
-  const double height = frame.height;
-  const std::vector<M_Vector4T<double>> clipper = {
-      {0, 0, 0, 1}, {width, 0, 0, 1}, {width, height, 0, 1}, {0, height, 0, 1}};
-  std::vector<M_Vector4T<double>> part;
-  for (const Point& p : shape.outline) part.push_back({p.x, p.y, 0, 1});
-  M_PolyPolyClip2D(&clipper, &part, &part);
+std::string DrawInFrame(const Shape& shape, const Size& frame, Labels* labels) {
+  const Homogeneous part = Clipped(
+      shape.outline, {0, 0, static_cast<double>(frame.width), static_cast<double>(frame.height)});
   if (part.empty()) return "";
   Point sum = {0, 0};
   for (const auto& p : part) sum = {sum.x + p.x, sum.y + p.y};
   const auto count = static_cast<double>(part.size());
-  return Polygon(part,
-                 "fill=\"none\" stroke=\"#222\" stroke-width=\"1\" stroke-dasharray=\"6 4\"") +
-         "<text x=\"" + ToText(sum.x / count) + "\" y=\"" + ToText(sum.y / count) + "\">" +
-         Escaped(shape.name) + "</text>\n";
+  return Polygon(part, "fill=\"none\" stroke=\"#222\" stroke-width=\"1\" stroke-dasharray=\"6 4\"",
+                 Title(shape.name)) +
+         labels->Place(shape.name, {sum.x / count, sum.y / count});
+}
+
+// Veils what is outside the frame.
+std::string DrawVeil(const M_FloatRect& box, const Size& frame) {
+  char text[200];
+  std::snprintf(
+      text, sizeof text,
+      "<path d=\"M%.0f %.0fH%.0fV%.0fH%.0fzM0 0V%dH%dV0z\" fill=\"#fff\" fill-opacity=\"0.5\"/>\n",
+      box.left, box.top, box.right, box.bottom, box.left, frame.height, frame.width);
+  return text;
 }
 
 }  // namespace
@@ -196,15 +241,23 @@ Picture Draw(const Composition& composition, const PictureOptions& options) {
                 "stroke-width=\"3\"/>\n",
                 -margin, -margin, frame.width + 2 * margin, frame.height + 2 * margin,
                 frame.height / 36 + 1, frame.width, frame.height);
-  Picture picture = {head, {}, sheet.reports};
+  Picture picture = {head + Title(composition.name) + "\n", {}, sheet.reports};
+  const M_FloatRect box = {-1.0 * margin, -1.0 * margin, frame.width + 1.0 * margin,
+                           frame.height + 1.0 * margin};
   std::vector<Point> all;
   for (const Shape& shape : shapes) {
-    picture.svg += DrawShape(shape);
+    picture.svg += DrawShape(shape, box);
     all.insert(all.end(), shape.outline.begin(), shape.outline.end());
   }
-  for (const Shape& shape : shapes) picture.svg += DrawInFrame(shape, frame);
+  picture.svg += DrawVeil(box, frame);
+  Labels labels(frame.height / 36 + 1);
+  // The names in front first.
+  for (auto shape = shapes.rbegin(); shape != shapes.rend(); ++shape) {
+    picture.svg += DrawInFrame(*shape, frame, &labels);
+  }
   M_ComputeConvexHull(all.cbegin(), all.cend(), all);
-  picture.svg += Polygon(all, "fill=\"none\" stroke=\"#999\" stroke-width=\"2\"");
+  picture.svg += Polygon(Clipped(all, box), "fill=\"none\" stroke=\"#999\" stroke-width=\"2\"",
+                         Title("the hull of all"));
 
   const auto front = [&](const Point& p) {
     return std::find_if(shapes.rbegin(), shapes.rend(),

@@ -41,7 +41,7 @@ std::string ToTable(const Scene& scene) {
                      ToText(camera.target) + ", zoom " + ToText(camera.zoom) + "\n";
   for (const SpaceLayer& layer : scene.layers) {
     const M_Matrix4Decomp& d = layer.decomp;
-    text += "\nLayer \"" + layer.name + "\", " + ToText(layer.size) +
+    text += "\nLayer \"" + Printable(layer.name) + "\", " + ToText(layer.size) +
             (layer.isDecomposable ? "" : ", cannot be taken apart") + "\n";
     text += Line("moved by", ToText(d.translate));
     text += Line("scaled by", ToText(d.scale));

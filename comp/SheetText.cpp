@@ -5,6 +5,7 @@
 
 #include "LayoutText.h"
 #include "SceneText.h"
+#include "Wording.h"
 
 namespace comp {
 namespace {
@@ -89,13 +90,13 @@ Json ToJson(const GivenRatio& ratio) {
 }  // namespace
 
 std::string ToTable(const Sheet& sheet) {
-  std::string text =
-      "Composition \"" + sheet.name + "\", " + ToText(sheet.frameRate) + " frames a second\n";
+  std::string text = "Composition \"" + Printable(sheet.name) + "\", " + ToText(sheet.frameRate) +
+                     " frames a second\n";
   text += Line("", "units", "seconds", "frames", "");
   text += Line("start", "", ToText(sheet.start.seconds), ToText(sheet.start.frames), "");
   text += Line("duration", "", ToText(sheet.duration.seconds), ToText(sheet.duration.frames), "");
   for (const Row& row : sheet.rows) {
-    text += "\nLayer \"" + row.name + "\", in ";
+    text += "\nLayer \"" + Printable(row.name) + "\", in ";
     text += row.hasSourceRate ? "frames of " + ToText(row.timeBase) + " a second"
                               : "units of " + ToText(row.timeBase) + " s";
     text += ", stretch " + ToText(row.stretch) + '\n';
@@ -121,7 +122,8 @@ std::string ToTable(const Sheet& sheet) {
   if (!sheet.reports.empty()) text += "\nReported by the library:\n";
   for (const Report& report : sheet.reports) {
     text.append("  [").append(IdText(report.id)).append("] ").append(report.text);
-    if (!report.layer.empty()) text.append(" (layer \"").append(report.layer).append("\")");
+    if (!report.layer.empty())
+      text.append(" (layer \"").append(Printable(report.layer)).append("\")");
     text += '\n';
   }
   return text;

@@ -6,6 +6,7 @@
 
 #include "M_Ops.h"
 #include "Timecode.h"
+#include "Wording.h"
 
 namespace comp {
 namespace {
@@ -63,14 +64,6 @@ std::string Decimal(const Seconds& time) {
 std::string Cell(const Clock& clock, const Seconds& time) {
   if (!time.IsKnown()) return "overflow";
   return std::string(clock.IsWhole(time) ? "" : "~").append(clock.Timecode(time));
-}
-
-// A name with nothing in it that moves a cursor.
-std::string Printable(std::string name) {
-  for (char& c : name) {
-    if (static_cast<unsigned char>(c) < 0x20 || c == 0x7F) c = '?';
-  }
-  return name;
 }
 
 // As much of a text as there is room for, by characters of UTF-8.

@@ -26,6 +26,33 @@ std::string ToText(const Size& size) {
   return std::to_string(size.width).append(" x ").append(std::to_string(size.height));
 }
 
+std::string Printable(std::string name) {
+  for (char& c : name) {
+    if (static_cast<unsigned char>(c) < 0x20 || c == 0x7F) c = '?';
+  }
+  return name;
+}
+
+std::string Escaped(const std::string& name) {
+  std::string escaped;
+  for (const char c : Printable(name)) {
+    switch (c) {
+      case '&':
+        escaped += "&amp;";
+        break;
+      case '<':
+        escaped += "&lt;";
+        break;
+      case '>':
+        escaped += "&gt;";
+        break;
+      default:
+        escaped += c;
+    }
+  }
+  return escaped;
+}
+
 std::string Line(const std::string& label, const std::string& text) {
   std::string line = std::string("  ").append(label);
   line.resize(std::max<size_t>(line.size() + 1, 14), ' ');

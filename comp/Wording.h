@@ -20,6 +20,12 @@ std::string ToText(const M_Vector3T<double>& v);
 /// "1920 x 1080"
 std::string ToText(const Size& size);
 
+/// A name from a file with nothing in it that moves a cursor, or that XML does not allow.
+std::string Printable(std::string name);
+
+/// The same with what has a meaning in XML written out.
+std::string Escaped(const std::string& name);
+
 /// An indented line with a label.
 std::string Line(const std::string& label, const std::string& text);
 

@@ -16,6 +16,7 @@
 #include "Otio.h"
 #include "Picture.h"
 #include "SheetText.h"
+#include "TimelinePicture.h"
 #include "TimelineText.h"
 #include "U.h"
 #include "Wording.h"
@@ -43,7 +44,8 @@ A FILE of - is the standard input.
   --drop-frame  timecode of 29.97 and 59.94 drops frames
   --help        prints this text
 
-With --svg a composition with a size is drawn instead: the frame, the outline of
+With --svg a timeline is drawn instead, its tracks as lanes; or a composition
+with a size: the frame, the outline of
 every layer, filled from back to front, with a dashed line around its part in
 the frame, layers seen from the side as a line, and the hull of them all.
 
@@ -97,12 +99,6 @@ std::string ReadText(const std::string& fileName) {
   return text.str();
 }
 
-comp::Composition ReadFile(const std::string& fileName) {
-  std::istringstream text(ReadText(fileName));
-  return comp::ReadComposition(text, fileName);
-}
-
-// The sheets of all files, complete before anything is printed.
 struct Arguments {
   bool asJson = false;
   bool mayDrop = false;  ///< Timecode of 29.97 and 59.94 drops frames.
@@ -191,24 +187,33 @@ Arguments ParseArguments(const std::vector<std::string>& words) {
   return arguments;
 }
 
+void WriteFile(const std::string& name, const std::string& text) {
+  std::ofstream file(name);
+  if (!(file << text << std::flush)) throw std::ios_base::failure(name + " cannot be written");
+}
+
 // Draws to a file; returns what is to be printed.
 std::string MakePicture(const Arguments& arguments) {
-  const comp::Composition composition = ReadFile(arguments.fileNames[0]);
+  const std::string& fileName = arguments.fileNames[0];
+  const std::string given = ReadText(fileName);
+  if (comp::IsOtio(given)) {
+    WriteFile(arguments.svg, comp::Draw(comp::ReadOtio(given, fileName)[0], arguments.mayDrop));
+    return "";
+  }
+  std::istringstream stream(given);
+  const comp::Composition composition = comp::ReadComposition(stream, fileName);
   if (!composition.size) {
-    throw comp::InputError(arguments.fileNames[0] +
-                           ": composition has no \"size\" to be drawn in.");
+    throw comp::InputError(fileName + ": composition has no \"size\" to be drawn in.");
   }
   const comp::Picture picture = comp::Draw(composition, arguments.picture);
-  std::ofstream file(arguments.svg);
-  if (!(file << picture.svg << std::flush)) {
-    throw std::ios_base::failure(arguments.svg + " cannot be written");
-  }
+  WriteFile(arguments.svg, picture.svg);
   for (const comp::Report& report : picture.reports) {
     std::cerr << "comp: layer \"" << report.layer << "\": " << report.text << '\n';
   }
   std::string text;
   for (const comp::Hit& hit : picture.hits) {
-    text += hit.name + ", " + comp::ToText(hit.distance) + " from its nearest edge\n";
+    text +=
+        comp::Printable(hit.name) + ", " + comp::ToText(hit.distance) + " from its nearest edge\n";
   }
   if (arguments.picture.point && text.empty()) text = "nothing\n";
   return text;
@@ -218,6 +223,8 @@ std::string MakePicture(const Arguments& arguments) {
 
 int main(int argc, char** argv) {
   std::setlocale(LC_ALL, "");
+  // What machines read has points in its decimals, wherever it is made.
+  std::setlocale(LC_NUMERIC, "C");
   const std::vector<std::string> words(argv + 1, argv + argc);
   if (std::find(words.begin(), words.end(), "--help") != words.end()) {
     std::cout << kHelp;

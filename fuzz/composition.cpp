@@ -1,18 +1,29 @@
-// The reader of the example's compositions, and what is made of what it has read.
+// The readers of compositions and timelines, and what is made of what they have read.
 
 #include <sstream>
 
 #include "Composition.h"
+#include "Otio.h"
 #include "Picture.h"
 #include "Sheet.h"
 #include "SheetText.h"
+#include "TimelinePicture.h"
+#include "TimelineText.h"
 #include "U.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   // Reports are part of the game: nobody wants to read them.
   U_SetReportCallback([](void*, const U_Report*) {}, nullptr);
-  std::istringstream stream(std::string(reinterpret_cast<const char*>(data), size));
+  const std::string text(reinterpret_cast<const char*>(data), size);
   try {
+    if (comp::IsOtio(text)) {
+      const auto timelines = comp::ReadOtio(text, "input");
+      comp::ToJson(timelines, true);
+      comp::ToTable(timelines, false);
+      comp::Draw(timelines[0], true);
+      return 0;
+    }
+    std::istringstream stream(text);
     const comp::Composition composition = comp::ReadComposition(stream, "input");
     const comp::Sheet sheet = comp::MakeSheet(composition);
     comp::ToJson(sheet);

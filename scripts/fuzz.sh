@@ -11,7 +11,7 @@ fuzz() {
     seeds=fuzz/corpus/NAME
     if [ NAME = composition ]; then
       seeds=
-      cp comp/samples/*.json build/fuzz/corpus/NAME
+      cp comp/samples/*.json comp/samples/*.otio build/fuzz/corpus/NAME
     fi
     if build/fuzz/bin/fuzz_NAME -max_total_time="$seconds" -timeout=20 -max_len=4096 -print_final_stats=1 \
       -artifact_prefix=build/fuzz/found/NAME- build/fuzz/corpus/NAME $seeds >build/fuzz/NAME.log 2>&1; then
