@@ -250,7 +250,8 @@ Picture Draw(const Composition& composition, const PictureOptions& options) {
     all.insert(all.end(), shape.outline.begin(), shape.outline.end());
   }
   picture.svg += DrawVeil(box, frame);
-  Labels labels(frame.height / 36 + 1);
+  const int letters = frame.height / 36 + 1;
+  Labels labels(letters);
   // The names in front first.
   for (auto shape = shapes.rbegin(); shape != shapes.rend(); ++shape) {
     picture.svg += DrawInFrame(*shape, frame, &labels);

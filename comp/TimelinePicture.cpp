@@ -93,17 +93,17 @@ class Drawing {
 
   // A mark at whole seconds, minutes or hours, as many as there is room for.
   std::string Ruler(double height) const {
-    constexpr double kSteps[] = {1,   2,   5,    10,   15,   30,    60,    120,  300,
-                                 600, 900, 1800, 3600, 7200, 14400, 43200, 86400};
+    constexpr int32_t kSteps[] = {1,   2,   5,    10,   15,   30,    60,    120,  300,
+                                  600, 900, 1800, 3600, 7200, 14400, 43200, 86400};
     const auto* step = std::find_if(std::begin(kSteps), std::end(kSteps) - 1,
-                                    [&](double s) { return length_ / s <= 8; });
+                                    [&](int32_t s) { return length_ / s <= 8; });
     std::string svg;
-    for (double at = 0; at <= length_ && at / *step < 1000; at += *step) {
-      const Seconds time = {{static_cast<int32_t>(at), 1}, true};
+    for (int32_t i = 0; i < 1000 && int64_t{i} * *step <= std::min(length_, 2e9); ++i) {
+      const Seconds time = {{i * *step, 1}, true};
       const std::string x = ToText(X(time));
       svg += Shape("line",
-                   "class=\"rule\" x1=\"" + x + "\" x2=\"" + x + "\" y1=\"" + ToText(kTop - 16) +
-                       "\" y2=\"" + ToText(height - 6) + "\"",
+                   std::string("class=\"rule\" x1=\"").append(x).append("\" x2=\"").append(x) +
+                       "\" y1=\"" + ToText(kTop - 16) + "\" y2=\"" + ToText(height - 6) + "\"",
                    "");
       if (X(time) > kWidth - kRight - 60) continue;  // No room for its name.
       svg += Text(X(time) + 3, kTop - 8, "class=\"quiet\" font-size=\"9\"",
