@@ -98,7 +98,8 @@ class Drawing {
     const auto* step = std::find_if(std::begin(kSteps), std::end(kSteps) - 1,
                                     [&](int32_t s) { return length_ / s <= 8; });
     std::string svg;
-    for (int32_t i = 0; i < 1000 && int64_t{i} * *step <= std::min(length_, 2e9); ++i) {
+    const auto last = static_cast<int32_t>(std::min(length_ / *step, 1000.0));
+    for (int32_t i = 0; i <= last; ++i) {
       const Seconds time = {{i * *step, 1}, true};
       const std::string x = ToText(X(time));
       svg += Shape("line",
