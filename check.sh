@@ -34,7 +34,7 @@ case ${1-} in
     ;;
 esac
 
-need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev librapidcheck-dev libbenchmark-dev pkg-config \
+need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libcli11-dev libgtest-dev librapidcheck-dev libbenchmark-dev pkg-config \
   binutils clang clang-format clang-tidy abigail-tools gdb perl python3
 
 echo "Checking the format ..."

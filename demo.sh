@@ -4,7 +4,7 @@ set -eu
 cd "$(dirname "$0")"
 . scripts/common.sh
 
-need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libgtest-dev librapidcheck-dev libbenchmark-dev pkg-config
+need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libcli11-dev libgtest-dev librapidcheck-dev libbenchmark-dev pkg-config
 build_preset release --target comp M_catalogues
 echo
 build/release/bin/comp comp/samples/film.json comp/samples/broadcast.json \

@@ -1,12 +1,16 @@
 // comp: prints the sheet of a composition file.
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
+#include <array>
 #include <charconv>
 #include <clocale>
 #include <cmath>
+#include <cstdio>
 #include <cstdlib>
 #include <fstream>
 #include <iostream>
+#include <new>
 #include <sstream>
 #include <string>
 #include <vector>
@@ -25,37 +29,23 @@ namespace {
 
 constexpr int kBadInput = 2;
 
-constexpr char kHelp[] = R"(Usage: comp [--json] [--drop-frame] FILE...
-       comp --svg OUT [--time FRAME] [--hit X,Y] [--tolerance D] [--grid N] FILE
+constexpr char kAbout[] =
+    R"(Prints the sheet of each file. Of a composition: its frame rate, start and
+duration, and for every layer its in and out points as exact ratios in seconds
+and as frames, also clipped to the composition, its stretch and the running sum
+of the durations; with a size also where its layers lie: what kind of matrix
+places each of them, its corners, the pixels it touches, those in the frame and
+those above each layer below it; and for layers in space how they are moved,
+scaled, sheared and turned, and where the camera sees them. Of a timeline of
+OpenTimelineIO (.otio): what is where in each track, record and source times as
+timecode, and how long everything is, exactly. A FILE of - is the standard input.
 
-Prints the sheet of each composition file: its frame rate, start and duration,
-and for every layer its in and out points as exact ratios in seconds and as
-frames, also clipped to the composition, its stretch and the running sum of the
-durations. For a composition with a size also where its layers lie: what kind of
-matrix places each of them, its corners, the pixels it touches, those in the
-frame and those above each layer below it; and for layers in space how they are
-moved, scaled, sheared and turned, and where the camera sees them.
+With --svg the file is drawn instead: a timeline's tracks as lanes; or, of a
+composition with a size, the frame, the outline of every layer, filled from back
+to front, with a dashed line around its part in the frame, layers seen from the
+side as a line, and the hull of them all.)";
 
-Of a timeline of OpenTimelineIO (.otio) it prints what is where in each track:
-record and source times as timecode, and how long everything is, exactly.
-A FILE of - is the standard input.
-
-  --json        prints the sheet as JSON
-  --drop-frame  timecode of 29.97 and 59.94 drops frames
-  --help        prints this text
-
-With --svg a timeline is drawn instead, its tracks as lanes; or a composition
-with a size: the frame, the outline of
-every layer, filled from back to front, with a dashed line around its part in
-the frame, layers seen from the side as a line, and the hull of them all.
-
-  --time FRAME   as it is at a frame; else with every layer, at its first key
-  --hit X,Y      marks a point, and prints the layers under it from front to back
-                 with the distance of their nearest edge
-  --tolerance D  pixels by which a hit may be beside a layer
-  --grid N       draws N x N points in the colours of the layers they hit
-
-A composition file is a JSON object:
+constexpr char kFormat[] = R"(A composition file is a JSON object:
   name       text
   frameRate  frames a second: "24000/1001", 25, or a decimal: 23.976, 29.97
              and their like stand for thousands over 1001
@@ -107,84 +97,74 @@ struct Arguments {
   std::vector<std::string> fileNames;
 };
 
-// The sheets of all files, complete before anything is printed.
+// The sheets of all files, complete before anything is printed. As JSON one document: all timelines
+// together, and an array where there is more than that.
 std::string MakeSheets(const Arguments& arguments) {
-  std::string text;
+  std::vector<std::string> documents;
+  std::vector<comp::Timeline> timelines;
   for (const std::string& fileName : arguments.fileNames) {
     const std::string file = ReadText(fileName);
-    if (!arguments.asJson && !text.empty()) text += '\n';
     if (comp::IsOtio(file)) {
-      const auto timelines = comp::ReadOtio(file, fileName);
-      text += arguments.asJson ? comp::ToJson(timelines, arguments.mayDrop)
-                               : comp::ToTable(timelines, arguments.mayDrop);
+      const auto read = comp::ReadOtio(file, fileName);
+      timelines.insert(timelines.end(), read.begin(), read.end());
+      if (!arguments.asJson) documents.push_back(comp::ToTable(read, arguments.mayDrop));
       continue;
     }
     std::istringstream stream(file);
     const comp::Sheet sheet = comp::MakeSheet(comp::ReadComposition(stream, fileName));
-    text += arguments.asJson ? comp::ToJson(sheet) : comp::ToTable(sheet);
+    documents.push_back(arguments.asJson ? comp::ToJson(sheet) : comp::ToTable(sheet));
   }
-  return text;
+  if (arguments.asJson && !timelines.empty()) {
+    documents.push_back(comp::ToJson(timelines, arguments.mayDrop));
+  }
+  const bool isArray = arguments.asJson && documents.size() > 1;
+  std::string text = isArray ? "[\n" : "";
+  for (const std::string& document : documents) {
+    if (&document != &documents[0]) text += isArray ? ",\n" : "\n";
+    text += document;
+  }
+  return isArray ? text + "]\n" : text;
 }
 
-// One or more numbers with commas between them, and nothing else.
-std::vector<double> ParseNumbers(const std::string& option, const std::string& text, size_t count) {
-  std::vector<double> numbers;
-  const char* at = text.data();
-  const char* const end = at + text.size();
-  while (numbers.size() < count) {
-    double number;
-    const auto [rest, error] = std::from_chars(at, end, number);
-    if (error != std::errc() || !std::isfinite(number)) break;
-    numbers.push_back(number);
-    at = rest;
-    if (numbers.size() == count || at == end || *at != ',') break;
-    ++at;
-  }
-  if (numbers.size() != count || at != end) {
-    throw comp::InputError(option + " takes " + (count == 1 ? "a number" : "two numbers") +
-                           ", not " + text + ".");
-  }
-  return numbers;
-}
-
-Arguments ParseArguments(const std::vector<std::string>& words) {
-  Arguments arguments;
-  for (size_t i = 0; i < words.size(); ++i) {
-    const std::string& word = words[i];
-    const auto next = [&] {
-      if (++i == words.size()) throw comp::InputError(word + " is not followed by a value.");
-      return words[i];
-    };
-    const auto number = [&] { return ParseNumbers(word, next(), 1)[0]; };
-    if (word == "--json") {
-      arguments.asJson = true;
-    } else if (word == "--svg") {
-      arguments.svg = next();
-    } else if (word == "--time") {
-      arguments.picture.frame = number();
-    } else if (word == "--hit") {
-      const auto numbers = ParseNumbers(word, next(), 2);
-      arguments.picture.point = {numbers[0], numbers[1]};
-    } else if (word == "--tolerance") {
-      arguments.picture.tolerance = number();
-    } else if (word == "--grid") {
-      const double points = number();
-      if (!(points >= 1 && points <= 1000))
-        throw comp::InputError("--grid takes 1 to 1000 points.");
-      arguments.picture.grid = static_cast<int>(points);
-    } else if (word == "--drop-frame") {
-      arguments.mayDrop = true;
-    } else if (word.starts_with("-") && word != "-") {
-      throw comp::InputError(word + " is not an option; see comp --help.");
-    } else {
-      arguments.fileNames.push_back(word);
-    }
-  }
-  if (arguments.fileNames.empty()) throw comp::InputError("no file is given; see comp --help.");
-  if (!arguments.svg.empty() && arguments.fileNames.size() != 1) {
-    throw comp::InputError("--svg draws one file.");
-  }
-  return arguments;
+// Tells the parser what there is. What it finds goes to `arguments`, which has to stay.
+void AddOptions(CLI::App* app, Arguments* arguments) {
+  const CLI::Validator finite(
+      [](std::string& text) {
+        double number;
+        const auto [rest, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+        const bool isFinite = error == std::errc() && *rest == '\0' && std::isfinite(number);
+        return isFinite ? std::string() : text + " is not a number";
+      },
+      "");
+  comp::PictureOptions& picture = arguments->picture;
+  app->set_version_flag("--version", COMP_VERSION);
+  app->add_option("FILE", arguments->fileNames, "compositions and timelines")->required();
+  auto* const json = app->add_flag("--json", arguments->asJson, "prints sheets as JSON");
+  app->add_flag("--drop-frame", arguments->mayDrop, "timecode of 29.97 and 59.94 drops frames");
+  auto* const svg = app->add_option("--svg", arguments->svg, "the file to draw to")->excludes(json);
+  app->add_option("--time", picture.frame,
+                  "as it is at a frame; else with every layer, at its first key")
+      ->needs(svg)
+      ->check(finite);
+  app->add_option_function<std::array<double, 2>>(
+         "--hit",
+         [&](const auto& point) {
+           picture.point = {point[0], point[1]};
+         },
+         "marks a point X,Y, and prints the layers under it from front to back with the distance "
+         "of "
+         "their nearest edge")
+      ->delimiter(',')
+      ->needs(svg)
+      ->check(finite);
+  app->add_option("--tolerance", picture.tolerance, "pixels by which a hit may be beside a layer")
+      ->needs(svg)
+      ->check(finite);
+  app->add_option("--grid", picture.grid,
+                  "draws N x N points in the colours of the layers they hit")
+      ->needs(svg)
+      ->check(CLI::Range(1, 1000));
+  app->footer(kFormat);
 }
 
 void WriteFile(const std::string& name, const std::string& text) {
@@ -219,23 +199,29 @@ std::string MakePicture(const Arguments& arguments) {
   return text;
 }
 
-}  // namespace
-
-int main(int argc, char** argv) {
+int Run(int argc, char** argv) {
   std::setlocale(LC_ALL, "");
   // What machines read has points in its decimals, wherever it is made.
   std::setlocale(LC_NUMERIC, "C");
-  const std::vector<std::string> words(argv + 1, argv + argc);
-  if (std::find(words.begin(), words.end(), "--help") != words.end()) {
-    std::cout << kHelp;
-    return 0;
+  Arguments arguments;
+  CLI::App app(kAbout, "comp");
+  AddOptions(&app, &arguments);
+  try {
+    app.parse(argc, argv);
+    if (!arguments.svg.empty() && arguments.fileNames.size() != 1) {
+      throw CLI::ValidationError("--svg draws one file");
+    }
+  } catch (const CLI::Success& asked) {
+    return app.exit(asked);
+  } catch (const CLI::ParseError& error) {
+    std::cerr << "comp: " << error.what() << "; see comp --help.\n";
+    return kBadInput;
   }
   // Birth and death are logged; a command line tool has no use for that.
   U_SetLogCallback([](void*, int32_t, const char*, const char*, const char*) {}, nullptr);
   if (M_Birth(0, nullptr) != 0) return EXIT_FAILURE;
   int status = 0;
   try {
-    const Arguments arguments = ParseArguments(words);
     const std::string text = arguments.svg.empty() ? MakeSheets(arguments) : MakePicture(arguments);
     if (!(std::cout << text << std::flush)) {
       std::cerr << "comp: the output cannot be written.\n";
@@ -250,4 +236,17 @@ int main(int argc, char** argv) {
   }
   M_Death();
   return status;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  try {
+    return Run(argc, argv);
+  } catch (const std::bad_alloc&) {
+    std::fputs("comp: there is not enough memory.\n", stderr);
+  } catch (const std::exception& error) {
+    std::fprintf(stderr, "comp: %s.\n", error.what());
+  }
+  return EXIT_FAILURE;
 }

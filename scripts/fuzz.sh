@@ -2,7 +2,7 @@
 
 #   fuzz SECONDS
 fuzz() {
-  need_packages clang libclang-rt-dev cmake ninja-build gettext nlohmann-json3-dev
+  need_packages clang libclang-rt-dev cmake ninja-build gettext nlohmann-json3-dev libcli11-dev
   build_preset fuzz
   mkdir -p build/fuzz/found
   export seconds="$1"

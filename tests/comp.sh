@@ -24,6 +24,7 @@ sheets --json | tr -d '\n' | perl -pe 's/ +/ /g; s/\{ "name"/\n$&/g;
   s/-?\d+\.\d{5,}(e-?\d+)?|-?\d+(\.\d+)?e-\d+/sprintf("%.4f", sprintf("%.4f", $&) + 0)/ge' >"$work/json"
 diff "$tests/comp_json.txt" "$work/json" || fail "< the JSON as it should be, > as it is"
 "$program" --help >"$work/help" && grep -q '^Usage: comp' "$work/help" || fail "--help does not help"
+"$program" --json "$samples/harbour.otio" - <"$samples/harbour.otio" | grep -c '"timelines"' | grep -qx 1 || fail "timelines are not one document"
 
 # Pictures, with their numbers in whole pixels.
 draw() {
@@ -69,18 +70,33 @@ refuse() {
 expected: comp: $sentence"
 }
 refuse "$work/none.json: cannot be read." "$work/none.json"
-refuse "no file is given; see comp --help."
-refuse "-f is not an option; see comp --help." -f "$samples/film.json"
-refuse "--svg is not followed by a value." "$samples/stage.json" --svg
-refuse "--svg draws one file." --svg "$work/picture" "$samples/stage.json" "$samples/space.json"
 refuse "$samples/film.json: composition has no \"size\" to be drawn in." --svg "$work/picture" "$samples/film.json"
-refuse "--hit takes two numbers, not 5." --grid 1 --hit 5 "$samples/stage.json"
-refuse "--hit takes two numbers, not 5,." --grid 1000 --hit 5, "$samples/stage.json"
-refuse "--hit takes two numbers, not 5,6,7." --hit 5,6,7 "$samples/stage.json"
-refuse "--time takes a number, not 1x." --time 1x "$samples/stage.json"
-refuse "--time takes a number, not inf." --time inf "$samples/stage.json"
-refuse "--grid takes 1 to 1000 points." --grid 1001 "$samples/stage.json"
-refuse "--grid takes 1 to 1000 points." --grid 0 "$samples/stage.json"
+while read -r sentence; do
+  read -r words
+  # shellcheck disable=SC2086
+  refuse "$sentence; see comp --help." $words
+done <<END
+FILE is required
+
+The following argument was not expected: -f
+-f $samples/film.json
+--svg: 1 required TEXT missing
+$samples/stage.json --svg
+--svg: At Most 1 required but received 2
+--svg $work/a --svg $work/b $samples/stage.json
+--svg draws one file
+--svg $work/picture $samples/stage.json $samples/space.json
+--hit: At Most 2 required but received 3
+--svg $work/picture --hit 5,6,7 $samples/stage.json
+--time: 1x is not a number
+--svg $work/picture --time 1x $samples/stage.json
+--time: inf is not a number
+--svg $work/picture --time inf $samples/stage.json
+--grid: Value 1001 not in range 1 to 1000
+--svg $work/picture --grid 1001 $samples/stage.json
+--grid requires --svg
+--grid 4 $samples/stage.json
+END
 while IFS='|' read -r edit sentence; do
   sed "$edit" "$tests/comp_base.json" >"$work/bad.json"
   refuse "$work/bad.json: $sentence" "$samples/film.json" "$work/bad.json"
