@@ -35,7 +35,7 @@ case ${1-} in
 esac
 
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libcli11-dev libgtest-dev librapidcheck-dev libbenchmark-dev pkg-config \
-  binutils clang clang-format clang-tidy abigail-tools gdb perl python3
+  binutils clang clang-format clang-tidy abigail-tools gdb perl python3 locales
 
 echo "Checking the format ..."
 find include src host comp examples tests bench fuzz python -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror

@@ -9,8 +9,10 @@
 #include <nlohmann/json.hpp>
 #include <optional>
 #include <set>
+#include <utility>
 
 #include "Rates.h"
+#include "Timecode.h"
 
 namespace comp {
 namespace {
@@ -59,6 +61,17 @@ class Fields {
                                                  : value.get<int64_t>() >= INT32_MIN;
     if (!fits) ComplainAbout(field, value.dump() + " has more than 32 bits");
     return value;
+  }
+
+  // A number of frames, or their timecode.
+  int32_t Start(const char* field, const M_Ratio& rate) const {
+    const Json& value = Get(field);
+    if (!value.is_string()) return Whole(field);
+    const auto frame = ParseTimecode(value.get<std::string>(), rate);
+    if (!frame || !std::in_range<int32_t>(*frame)) {
+      ComplainAbout(field, value.dump() + " is no timecode of this rate");
+    }
+    return static_cast<int32_t>(*frame);
   }
 
   // A positive ratio: "30000/1001", 25, "25", 23.976 or "23.976".
@@ -353,7 +366,7 @@ Composition ReadComposition(std::istream& in, const std::string& fileName) {
   Composition composition;
   composition.name = fields.Name();
   composition.frameRate = fields.Ratio("frameRate", true);
-  composition.start = fields.Whole("start");
+  composition.start = fields.Start("start", composition.frameRate.ratio);
   composition.duration = fields.Whole("duration");
   if (composition.duration <= 0) fields.ComplainAbout("duration", "is not greater than zero");
   if (fields.Has("size")) {

@@ -1,5 +1,8 @@
 #include "Layout.h"
 
+#include <algorithm>
+#include <numeric>
+
 namespace comp {
 namespace {
 
@@ -34,6 +37,32 @@ PlacedLayer Place(const Layer& layer, const Size& frame) {
   return placed;
 }
 
+// By a sweep from left to right, so that only neighbours are compared.
+void FindOverlaps(std::vector<PlacedLayer>* layers) {
+  std::vector<size_t> order(layers->size()), open;
+  std::iota(order.begin(), order.end(), 0);
+  const auto bounds = [&](size_t i) -> const M_LRect& { return (*layers)[i].bounds; };
+  std::ranges::stable_sort(order, {}, [&](size_t i) { return bounds(i).left; });
+  std::vector<std::vector<size_t>> below(layers->size());
+  for (const size_t i : order) {
+    std::erase_if(open, [&](size_t other) { return bounds(other).right <= bounds(i).left; });
+    for (const size_t other : open) {
+      if (M_LRectCompare(7, &bounds(i), &bounds(other))) {
+        below[std::min(i, other)].push_back(std::max(i, other));
+      }
+    }
+    open.push_back(i);
+  }
+  for (size_t i = 0; i < layers->size(); ++i) {
+    std::ranges::sort(below[i]);
+    for (const size_t other : below[i]) {
+      M_LRect common;
+      M_SectLRect(&bounds(i), &bounds(other), &common);
+      (*layers)[i].overlaps.push_back({(*layers)[other].name, common});
+    }
+  }
+}
+
 }  // namespace
 
 std::array<M_Vector2T<double>, 4> CornersOf(const Placement& placement) {
@@ -45,7 +74,8 @@ std::array<M_Vector2T<double>, 4> CornersOf(const Placement& placement) {
   return corners;
 }
 
-std::optional<Layout> MakeLayout(const Composition& composition, ReportCollector& collector) {
+std::optional<Layout> MakeLayout(const Composition& composition, bool withOverlaps,
+                                 ReportCollector& collector) {
   if (!composition.size) return {};
   Layout layout = {*composition.size, {}, {}};
   for (const Layer& layer : composition.layers) {
@@ -53,14 +83,9 @@ std::optional<Layout> MakeLayout(const Composition& composition, ReportCollector
     collector.SetLayer(layer.name);
     layout.layers.push_back(Place(layer, layout.frame));
   }
-  for (auto layer = layout.layers.begin(); layer != layout.layers.end(); ++layer) {
-    for (auto below = layer + 1; below != layout.layers.end(); ++below) {
-      M_LRect common;
-      if (M_SectLRect(&layer->bounds, &below->bounds, &common)) {
-        layer->overlaps.push_back({below->name, common});
-      }
-    }
-    M_UnionLRect(&layout.all, &layer->bounds, &layout.all);
+  if (withOverlaps) FindOverlaps(&layout.layers);
+  for (const PlacedLayer& layer : layout.layers) {
+    M_UnionLRect(&layout.all, &layer.bounds, &layout.all);
   }
   return layout;
 }

@@ -29,7 +29,7 @@ struct PlacedLayer {
   std::array<M_Vector2T<double>, 4> corners;  ///< Left top, right top, right bottom, left bottom.
   M_LRect bounds;                             ///< All pixels that the layer touches.
   M_LRect inFrame;
-  std::vector<Overlap> overlaps;  ///< With those below it, from the top down.
+  std::vector<Overlap> overlaps;  ///< With those below it, from the top down, if asked for.
 };
 
 struct Layout {
@@ -42,7 +42,8 @@ struct Layout {
 std::array<M_Vector2T<double>, 4> CornersOf(const Placement& placement);
 
 /// Nothing for a composition without a size.
-std::optional<Layout> MakeLayout(const Composition& composition, ReportCollector& collector);
+std::optional<Layout> MakeLayout(const Composition& composition, bool withOverlaps,
+                                 ReportCollector& collector);
 
 }  // namespace comp
 

@@ -44,7 +44,7 @@ class SheetMaker {
     duration_ = Calculate(M_MulRatio, Units(composition.duration), frame_);
   }
 
-  Sheet Make(ReportCollector& collector) const {
+  Sheet Make(bool withOverlaps, ReportCollector& collector) const {
     Sheet sheet;
     sheet.name = composition_.name;
     sheet.frameRate = composition_.frameRate;
@@ -58,7 +58,7 @@ class SheetMaker {
       row.runningSum = sum;
       sheet.rows.push_back(std::move(row));
     }
-    sheet.layout = MakeLayout(composition_, collector);
+    sheet.layout = MakeLayout(composition_, withOverlaps, collector);
     const auto isInSpace = [](const Layer& layer) { return layer.space.has_value(); };
     if (std::ranges::any_of(composition_.layers, isInSpace)) {
       sheet.scene = MakeScene(composition_, collector);
@@ -125,9 +125,9 @@ class SheetMaker {
 
 }  // namespace
 
-Sheet MakeSheet(const Composition& composition) {
+Sheet MakeSheet(const Composition& composition, bool withOverlaps) {
   ReportCollector collector;
-  return SheetMaker(composition).Make(collector);
+  return SheetMaker(composition).Make(withOverlaps, collector);
 }
 
 }  // namespace comp

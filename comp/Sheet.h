@@ -62,7 +62,8 @@ struct Sheet {
   std::vector<Report> reports;  ///< What the library reported on the way.
 };
 
-Sheet MakeSheet(const Composition& composition);
+/// With what layers have in common where that is asked for.
+Sheet MakeSheet(const Composition& composition, bool withOverlaps = false);
 
 }  // namespace comp
 

@@ -34,8 +34,7 @@ constexpr char kAbout[] =
 duration, and for every layer its in and out points as exact ratios in seconds
 and as frames, also clipped to the composition, its stretch and the running sum
 of the durations; with a size also where its layers lie: what kind of matrix
-places each of them, its corners, the pixels it touches, those in the frame and
-those above each layer below it; and for layers in space how they are moved,
+places each of them, its corners, the pixels it touches and those in the frame; and for layers in space how they are moved,
 scaled, sheared and turned, and where the camera sees them. Of a timeline of
 OpenTimelineIO (.otio): what is where in each track, record and source times as
 timecode, and how long everything is, exactly. A FILE of - is the standard input.
@@ -49,7 +48,7 @@ constexpr char kFormat[] = R"(A composition file is a JSON object:
   name       text
   frameRate  frames a second: "24000/1001", 25, or a decimal: 23.976, 29.97
              and their like stand for thousands over 1001
-  start      first frame
+  start      first frame, or its timecode, "01:00:00:00"
   duration   number of frames
   size       width and height of the frame in pixels, [1920, 1080]; may be left
              out, and so may all that follows from it
@@ -91,6 +90,7 @@ std::string ReadText(const std::string& fileName) {
 
 struct Arguments {
   bool asJson = false;
+  bool withOverlaps = false;
   bool mayDrop = false;  ///< Timecode of 29.97 and 59.94 drops frames.
   std::string svg;       ///< The file to draw to, if any.
   comp::PictureOptions picture;
@@ -111,7 +111,8 @@ std::string MakeSheets(const Arguments& arguments) {
       continue;
     }
     std::istringstream stream(file);
-    const comp::Sheet sheet = comp::MakeSheet(comp::ReadComposition(stream, fileName));
+    const comp::Sheet sheet =
+        comp::MakeSheet(comp::ReadComposition(stream, fileName), arguments.withOverlaps);
     documents.push_back(arguments.asJson ? comp::ToJson(sheet) : comp::ToTable(sheet));
   }
   if (arguments.asJson && !timelines.empty()) {
@@ -140,6 +141,7 @@ void AddOptions(CLI::App* app, Arguments* arguments) {
   app->set_version_flag("--version", COMP_VERSION);
   app->add_option("FILE", arguments->fileNames, "compositions and timelines")->required();
   auto* const json = app->add_flag("--json", arguments->asJson, "prints sheets as JSON");
+  app->add_flag("--overlaps", arguments->withOverlaps, "also what layers have in common");
   app->add_flag("--drop-frame", arguments->mayDrop, "timecode of 29.97 and 59.94 drops frames");
   auto* const svg = app->add_option("--svg", arguments->svg, "the file to draw to")->excludes(json);
   app->add_option("--time", picture.frame,

@@ -41,10 +41,17 @@ status=0
 "$program" --svg "$work/no/picture" "$samples/stage.json" >"$work/out" 2>"$work/err" || status=$?
 [ "$status" = 1 ] && grep -q 'picture cannot be written' "$work/err" || fail "exit status $status where nothing can be drawn"
 
+# Where decimals have a comma, machines still read points.
+if localedef -i de_DE -f UTF-8 "$work/de_DE.UTF-8" 2>/dev/null; then
+  LOCPATH=$work LC_ALL=de_DE.UTF-8 "$program" --svg "$work/german" "$samples/space.json" 2>/dev/null
+  LC_ALL=C "$program" --svg "$work/plain" "$samples/space.json" 2>/dev/null
+  cmp "$work/german" "$work/plain" || fail "a picture follows the locale"
+fi
+
 # EDIT of the base file, what its sheet then says.
 says() {
   sed "$1" "$tests/comp_base.json" >"$work/edited.json"
-  LC_ALL=C "$program" "$work/edited.json" | grep -q "$2" || fail "no '$2' with $1"
+  LC_ALL=C "$program" --overlaps "$work/edited.json" | grep -q "$2" || fail "no '$2' with $1"
 }
 says 's/24/"30000\/1001"/; s/48/2147483647/' '^  in  .* ~0$'
 says 's/24/"30000\/1001"/; s/"start": 0/"start": 2147483647/' '^  in  .* 0  *~[0-9]*$'
@@ -54,6 +61,7 @@ says 's/24/24, "size": [9, 9], "camera": {"eye": [1, 2, 3], "target": [4, 6, 15]
 says 's/24/24, "size": [9, 9]/; s/"in": 0/"in": 0, "size": [2, 3], "anchor": [0, 0], "position": [0, 0], "scale": [2, 3]/' 'placed by scale$'
 says 's/24/24, "size": [9, 9]/; s/"in": 0/"in": 0, "size": [4, 4], "position": [-9, -9]/; s/{"name": "L".*}\]/&/; 2s/ *\({.*}\)\]/\1, \1]/' '^  over "L"  *-11,-11 to -7,-7$'
 says 's/24/24, "size": [9, 9]/; s/"in": 0/"in": 0, "size": [1, 1], "position": [1, 2, 3], "keys": [{"frame": 0, "quaternion": [0, 0, 0, 2]}, {"frame": 4, "quaternion": [0, 0, 1, 0]}]/' '^  frame 2     (0, 0, 53.13)$'
+says 's/"start": 0/"start": "00:01:00:00"/' '^  start  *1440/24  *1440$'
 says 's/24/24, "size": [30000, 1]/' '^Frame 30000 x 1,'
 says 's/24/24, "size": [16, 9]/; s/"in": 0/"in": 0, "size": [1, 1], "position": [1, 2, 3]/' '^Space, seen from (8, 4.5, -16) towards (8, 4.5, 0), zoom 16$'
 says '1s/$/]}/; 2d' '^Sum of the durations: 0 s, exact$'
