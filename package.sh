@@ -6,7 +6,7 @@ cd "$(dirname "$0")"
 . scripts/common.sh
 
 need_packages g++ cmake ninja-build gettext pkg-config debhelper lintian doxygen doxygen-awesome-css dh-python \
-  pybind11-dev python3-dev python3-numpy
+  pybind11-dev python3-dev python3-numpy libcli11-dev nlohmann-json3-dev
 packages=build/packages
 rm -rf $packages
 mkdir -p $packages/source
@@ -60,6 +60,9 @@ grep -F '$2 = 240' "$work/log" || fail "gdb does not know M_TransformPoly3D."
 [ -s /usr/share/doc/libm-math-dev/html/index.html ] && [ -s /usr/share/doc/libm-math-dev/README.md.gz ] || fail "The documents are not there."
 echo "In Python:"
 (cd "$work" && /usr/bin/python3 -c 'import m_math; print(m_math.frame_at(7200, "30000/1001"), m_math.__file__)') || fail "m_math does not work."
+echo "The program:"
+/usr/bin/comp --version || fail "comp does not work."
+/usr/bin/comp --json comp/samples/harbour.otio >"$work/log" 2>&1 || fail "comp does not read a timeline."
 remove || fail "The packages cannot be removed."
 # What is left are folders that others have files in.
 while read -r file; do [ ! -f "$file" ] || fail "$file is left."; done <"$work/files"

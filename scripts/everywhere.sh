@@ -14,7 +14,7 @@ everywhere_one() {
   mkdir -p build/everywhere
   {
     cmake -S . -B "$folder" -G Ninja -DCMAKE_BUILD_TYPE=None -DCMAKE_CXX_COMPILER="$compiler" \
-      -DCMAKE_CXX_FLAGS="$flags" -DM_BUILD_EXAMPLES=OFF -DM_BUILD_TESTS=OFF -DM_BUILD_BENCH=OFF "$@" &&
+      -DCMAKE_CXX_FLAGS="$flags" -DM_BUILD_COMP=OFF -DM_BUILD_TESTS=OFF -DM_BUILD_BENCH=OFF "$@" &&
       cmake --build "$folder" -j 2
   } >"$log" 2>&1 || {
     cat "$log"
