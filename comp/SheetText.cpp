@@ -39,6 +39,11 @@ std::string ToText(const GivenRatio& ratio) {
   return text;
 }
 
+// The same of a rate, which people know by its decimal.
+std::string ToRate(const GivenRatio& rate) {
+  return rate.given.empty() ? RateText(rate.ratio) : ToText(rate);
+}
+
 std::string IdText(uint32_t id) {
   char text[16];
   std::snprintf(text, sizeof text, "0x%06X", static_cast<unsigned>(id));
@@ -90,14 +95,14 @@ Json ToJson(const GivenRatio& ratio) {
 }  // namespace
 
 std::string ToTable(const Sheet& sheet) {
-  std::string text = "Composition \"" + Printable(sheet.name) + "\", " + ToText(sheet.frameRate) +
+  std::string text = "Composition \"" + Printable(sheet.name) + "\", " + ToRate(sheet.frameRate) +
                      " frames a second\n";
   text += Line("", "units", "seconds", "frames", "");
   text += Line("start", "", ToText(sheet.start.seconds), ToText(sheet.start.frames), "");
   text += Line("duration", "", ToText(sheet.duration.seconds), ToText(sheet.duration.frames), "");
   for (const Row& row : sheet.rows) {
     text += "\nLayer \"" + Printable(row.name) + "\", in ";
-    text += row.hasSourceRate ? "frames of " + ToText(row.timeBase) + " a second"
+    text += row.hasSourceRate ? "frames of " + ToRate(row.timeBase) + " a second"
                               : "units of " + ToText(row.timeBase) + " s";
     text += ", stretch " + ToText(row.stretch) + '\n';
     text += Line("", "units", "seconds", "frames", "clipped");

@@ -40,19 +40,6 @@ std::string RatioText(const M_Ratio& r) {
   return std::to_string(r.num).append("/").append(std::to_string(r.den));
 }
 
-// "25", or "29.97 (30000/1001)".
-std::string RateText(const M_Ratio& rate) {
-  std::ostringstream text;
-  if (rate.den == 1) {
-    text << rate;
-  } else {
-    char decimal[32];
-    std::snprintf(decimal, sizeof decimal, "%.5g", rate.num / static_cast<double>(rate.den));
-    text << decimal << " (" << rate << ')';
-  }
-  return text.str();
-}
-
 std::string Decimal(const Seconds& time) {
   if (!time.IsKnown()) return "overflow";
   char text[40];

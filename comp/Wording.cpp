@@ -3,6 +3,9 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <sstream>
+
+#include "M_Ops.h"
 
 namespace comp {
 
@@ -24,6 +27,18 @@ std::string ToText(const M_Vector3T<double>& v) { return ToText({v.x, v.y, v.z})
 
 std::string ToText(const Size& size) {
   return std::to_string(size.width).append(" x ").append(std::to_string(size.height));
+}
+
+std::string RateText(const M_Ratio& rate) {
+  std::ostringstream text;
+  if (rate.den == 1) {
+    text << rate;
+  } else {
+    char decimal[32];
+    std::snprintf(decimal, sizeof decimal, "%.5g", rate.num / static_cast<double>(rate.den));
+    text << decimal << " (" << rate << ')';
+  }
+  return text.str();
 }
 
 std::string Printable(std::string name) {
