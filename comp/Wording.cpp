@@ -6,6 +6,7 @@
 #include <sstream>
 
 #include "M_Ops.h"
+#include "Rates.h"
 
 namespace comp {
 
@@ -34,8 +35,14 @@ std::string RateText(const M_Ratio& rate) {
   if (rate.den == 1) {
     text << rate;
   } else {
+    // As few digits as tell it.
     char decimal[32];
-    std::snprintf(decimal, sizeof decimal, "%.5g", rate.num / static_cast<double>(rate.den));
+    for (int digits = 5; digits < 17; ++digits) {
+      std::snprintf(decimal, sizeof decimal, "%.*g", digits,
+                    rate.num / static_cast<double>(rate.den));
+      const auto read = ToRatio(decimal, true);
+      if (read && read->ratio == rate) break;
+    }
     text << decimal << " (" << rate << ')';
   }
   return text.str();
