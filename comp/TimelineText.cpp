@@ -119,6 +119,37 @@ std::string ToTable(const std::vector<Timeline>& timelines, bool mayDrop) {
   return text + "\n~ marks a time that is not exact, or lies within a frame.\n";
 }
 
+std::string ToCsv(const std::vector<Timeline>& timelines, bool mayDrop) {
+  const auto quoted = [](const std::string& text) {
+    std::string field = "\"";
+    for (const char c : text) field.append(c == '"' ? 2 : 1, c);
+    return field + '"';
+  };
+  std::string text =
+      "timeline,track,kind,name,record in,record out,source in,source out,speed,exact,timecode "
+      "in,timecode out\n";
+  for (const Timeline& timeline : timelines) {
+    const Clock clock(timeline.rate, mayDrop);
+    for (size_t i = 0; i < timeline.tracks.size(); ++i) {
+      for (const Item& item : timeline.tracks[i].items) {
+        text += quoted(timeline.name) + ',' + std::to_string(i + 1) + ',' +
+                kKinds[static_cast<int>(item.kind)] + ',' + quoted(item.name);
+        bool isExact = true;
+        for (const Seconds& time : {item.recordIn, item.recordOut, item.sourceIn, item.sourceOut}) {
+          text.append(",").append(time.IsKnown() ? RatioText(time.ratio) : "");
+          isExact &= time.isExact;
+        }
+        text.append(",").append(RatioText(item.speed)).append(isExact ? ",1" : ",0");
+        for (const Seconds& time : {item.recordIn, item.recordOut}) {
+          text.append(",").append(time.IsKnown() ? clock.Timecode(time) : "");
+        }
+        text += '\n';
+      }
+    }
+  }
+  return text;
+}
+
 std::string ToJson(const std::vector<Timeline>& timelines, bool mayDrop) {
   Json all = Json::array();
   for (const Timeline& timeline : timelines) {

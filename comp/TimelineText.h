@@ -13,6 +13,10 @@ namespace comp {
 /// A table for each timeline. With dropped frames where its rate may have them.
 std::string ToTable(const std::vector<Timeline>& timelines, bool mayDrop);
 
+/// A line of comma-separated values for each item, after one of their names. Times are exact
+/// seconds, and timecode.
+std::string ToCsv(const std::vector<Timeline>& timelines, bool mayDrop);
+
 /// {"timelines": [...]}
 std::string ToJson(const std::vector<Timeline>& timelines, bool mayDrop);
 

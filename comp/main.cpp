@@ -90,6 +90,7 @@ std::string ReadText(const std::string& fileName) {
 
 struct Arguments {
   bool asJson = false;
+  bool asCsv = false;  ///< Timelines only.
   bool withOverlaps = false;
   bool mayDrop = false;  ///< Timecode of 29.97 and 59.94 drops frames.
   std::string svg;       ///< The file to draw to, if any.
@@ -102,14 +103,16 @@ struct Arguments {
 std::string MakeSheets(const Arguments& arguments) {
   std::vector<std::string> documents;
   std::vector<comp::Timeline> timelines;
+  const bool areTogether = arguments.asJson || arguments.asCsv;
   for (const std::string& fileName : arguments.fileNames) {
     const std::string file = ReadText(fileName);
     if (comp::IsOtio(file)) {
       const auto read = comp::ReadOtio(file, fileName);
       timelines.insert(timelines.end(), read.begin(), read.end());
-      if (!arguments.asJson) documents.push_back(comp::ToTable(read, arguments.mayDrop));
+      if (!areTogether) documents.push_back(comp::ToTable(read, arguments.mayDrop));
       continue;
     }
+    if (arguments.asCsv) throw comp::InputError(fileName + ": --csv is for timelines.");
     std::istringstream stream(file);
     const comp::Sheet sheet =
         comp::MakeSheet(comp::ReadComposition(stream, fileName), arguments.withOverlaps);
@@ -118,6 +121,7 @@ std::string MakeSheets(const Arguments& arguments) {
   if (arguments.asJson && !timelines.empty()) {
     documents.push_back(comp::ToJson(timelines, arguments.mayDrop));
   }
+  if (arguments.asCsv) documents.push_back(comp::ToCsv(timelines, arguments.mayDrop));
   const bool isArray = arguments.asJson && documents.size() > 1;
   std::string text = isArray ? "[\n" : "";
   for (const std::string& document : documents) {
@@ -141,6 +145,8 @@ void AddOptions(CLI::App* app, Arguments* arguments) {
   app->set_version_flag("--version", COMP_VERSION);
   app->add_option("FILE", arguments->fileNames, "compositions and timelines")->required();
   auto* const json = app->add_flag("--json", arguments->asJson, "prints sheets as JSON");
+  app->add_flag("--csv", arguments->asCsv, "prints timelines as comma-separated values")
+      ->excludes(json);
   app->add_flag("--overlaps", arguments->withOverlaps, "also what layers have in common");
   app->add_flag("--drop-frame", arguments->mayDrop, "timecode of 29.97 and 59.94 drops frames");
   auto* const svg = app->add_option("--svg", arguments->svg, "the file to draw to")->excludes(json);

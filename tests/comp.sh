@@ -24,6 +24,8 @@ sheets --json | tr -d '\n' | perl -pe 's/ +/ /g; s/\{ "name"/\n$&/g;
   s/-?\d+\.\d{5,}(e-?\d+)?|-?\d+(\.\d+)?e-\d+/sprintf("%.4f", sprintf("%.4f", $&) + 0)/ge' >"$work/json"
 diff "$tests/comp_json.txt" "$work/json" || fail "< the JSON as it should be, > as it is"
 "$program" --help >"$work/help" && grep -q '^Usage: comp' "$work/help" || fail "--help does not help"
+row='"Harbour at dawn",1,clip,"Net",1751/250,12009/1000,1001/1000,7007/2000,1/2,1,00:00:07:00,00:00:12:00'
+"$program" --csv "$samples/harbour.otio" | grep -qxF "$row" || fail "no $row"
 "$program" --json "$samples/harbour.otio" - <"$samples/harbour.otio" | grep -c '"timelines"' | grep -qx 1 || fail "timelines are not one document"
 
 # Pictures, with their numbers in whole pixels.
