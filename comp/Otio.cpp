@@ -17,8 +17,10 @@ namespace {
 using Json = nlohmann::json;
 
 // Writers put Infinity, NaN and numbers beyond a double into their metadata, which JSON has not:
-// they become null. The rest stays, byte by byte.
-std::string WithoutOddNumbers(const std::string& text) {
+// they become null. The rest stays, byte by byte. A file that is nested deeper than any edit
+// throws.
+std::string WithoutOddNumbers(const std::string& text, const std::string& fileName) {
+  int depth = 0;
   std::string plain;
   plain.reserve(text.size());
   for (size_t i = 0; i < text.size();) {
@@ -40,6 +42,8 @@ std::string WithoutOddNumbers(const std::string& text) {
                               token != "null" && std::isinf(std::strtod(token.c_str(), nullptr));
       plain += isName || isTooLarge ? "null" : token;
     } else {
+      depth += c == '{' || c == '[' ? 1 : c == '}' || c == ']' ? -1 : 0;
+      if (depth > 1000) throw InputError(fileName + ": is nested too deeply.");
       plain += c;
     }
     i = end;
@@ -109,7 +113,8 @@ class Reader {
     const Json& rate = Get(time, "rate");
     if (!rate.is_number()) return {};
     const auto ratio = ToRatio(rate.dump(), true);
-    if (!ratio || ratio->ratio.num <= 0) return {};
+    // Neither may be more than a num holds: a frame is its reciprocal.
+    if (!ratio || ratio->ratio.num <= 0 || ratio->ratio.den > INT32_MAX) return {};
     if (!ratio->isExact)
       Remark("the rate " + rate.dump() + " is no ratio of 32 bits: the nearest is taken");
     return ratio->ratio;
@@ -192,15 +197,29 @@ class Reader {
     track.name = Name(json);
     const Json& kind = Get(json, "kind");
     track.kind = kind.is_string() ? kind.get<std::string>() : "Video";
-    // Of a trimmed track, what is in the trim.
     const auto trim = ReadRange(Get(json, "source_range"));
     Seconds at = Seconds() - (trim ? trim->start : Seconds());
+    // Of a trimmed track, what is in the trim.
+    const auto add = [&](Item item) {
+      if (trim) {
+        const Seconds before = Seconds() - item.recordIn, behind = item.recordOut - trim->duration;
+        if (!(Seconds() < item.recordOut) || !(item.recordIn < trim->duration)) return;
+        if (Seconds() < before) {
+          item.recordIn = Seconds();
+          item.sourceIn = item.sourceIn + before * item.speed;
+        }
+        if (Seconds() < behind) {
+          item.recordOut = trim->duration;
+          item.sourceOut = item.sourceOut - behind * item.speed;
+        }
+      }
+      track.items.push_back(std::move(item));
+    };
     for (const Json& child : List(json, "children")) {
       if (IsA(child, "Transition")) {
         const Seconds in = Time(Get(child, "in_offset")).value_or(Seconds());
         const Seconds out = Time(Get(child, "out_offset")).value_or(Seconds());
-        track.items.push_back(
-            {Item::Kind::kTransition, Name(child), at - in, at + out, Seconds() - in, out, {1, 1}});
+        add({Item::Kind::kTransition, Name(child), at - in, at + out, Seconds() - in, out, {1, 1}});
         continue;
       }
       const bool isNested = IsA(child, "Stack") || IsTrack(child) || IsA(child, "Timeline");
@@ -213,9 +232,9 @@ class Reader {
       const Item::Kind itemKind = isNested             ? Item::Kind::kStack
                                   : IsA(child, "Clip") ? Item::Kind::kClip
                                                        : Item::Kind::kGap;
-      track.items.push_back({itemKind, Name(child), at, at + range.duration, range.start,
-                             range.start + range.duration * speed, speed});
-      at = at + range.duration;
+      const Seconds end = at + range.duration, sourceEnd = range.start + range.duration * speed;
+      add({itemKind, Name(child), at, end, range.start, sourceEnd, speed});
+      at = end;
     }
     track.duration = trim ? trim->duration : at;
     return track;
@@ -285,7 +304,7 @@ class Reader {
 bool IsOtio(const std::string& text) { return text.find("\"OTIO_SCHEMA\"") != std::string::npos; }
 
 std::vector<Timeline> ReadOtio(const std::string& text, const std::string& fileName) {
-  const Json root = Json::parse(WithoutOddNumbers(text), nullptr, false);
+  const Json root = Json::parse(WithoutOddNumbers(text, fileName), nullptr, false);
   if (root.is_discarded()) throw InputError(fileName + ": is not JSON, or ends too soon.");
   return Reader(fileName).Read(root);
 }

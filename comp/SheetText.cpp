@@ -12,10 +12,6 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-std::string RatioText(const M_Ratio& r) {
-  return std::to_string(r.num).append("/").append(std::to_string(r.den));
-}
-
 std::string ToText(const M_Ratio& r) { return r.den == 1 ? std::to_string(r.num) : RatioText(r); }
 
 // A number with its mark where it is not exact.

@@ -22,7 +22,7 @@ bool MayDrop(const M_Ratio& rate) {
 
 std::string ToTimecode(int64_t frame, const M_Ratio& rate, bool isDropped) {
   const int64_t nominal = Nominal(rate);
-  uint64_t number = M_OpsDetail::Magnitude(frame);
+  uint64_t number = frame < 0 ? 0 - static_cast<uint64_t>(frame) : static_cast<uint64_t>(frame);
   if (isDropped) {
     const auto dropped = static_cast<uint64_t>(nominal / 15),
                perMinute = static_cast<uint64_t>(nominal) * 60;

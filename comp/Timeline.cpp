@@ -6,7 +6,7 @@ namespace comp {
 namespace {
 
 // By the library: exactly, or approximated, or not at all.
-Seconds Calculate(M_OpsDetail::Operation* operation, const Seconds& a, const Seconds& b) {
+Seconds Calculate(decltype(M_AddRatio)* operation, const Seconds& a, const Seconds& b) {
   if (!a.IsKnown() || !b.IsKnown()) return {{0, 0}, false};
   unsigned char mayApproximate = 2;
   Seconds result;

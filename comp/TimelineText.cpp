@@ -36,10 +36,6 @@ class Clock {
   bool isDropped_;
 };
 
-std::string RatioText(const M_Ratio& r) {
-  return std::to_string(r.num).append("/").append(std::to_string(r.den));
-}
-
 std::string Decimal(const Seconds& time) {
   if (!time.IsKnown()) return "overflow";
   char text[40];

@@ -30,6 +30,10 @@ std::string ToText(const Size& size) {
   return std::to_string(size.width).append(" x ").append(std::to_string(size.height));
 }
 
+std::string RatioText(const M_Ratio& ratio) {
+  return std::to_string(ratio.num).append("/").append(std::to_string(ratio.den));
+}
+
 std::string RateText(const M_Ratio& rate) {
   std::ostringstream text;
   if (rate.den == 1) {

@@ -20,6 +20,9 @@ std::string ToText(const M_Vector3T<double>& v);
 /// "1920 x 1080"
 std::string ToText(const Size& size);
 
+/// "25/1"
+std::string RatioText(const M_Ratio& ratio);
+
 /// A rate, "25" or "29.97 (30000/1001)".
 std::string RateText(const M_Ratio& rate);
 

@@ -21,7 +21,6 @@
 #endif
 
 #include <algorithm>
-#include <bit>
 #include <charconv>
 #include <compare>
 #include <concepts>
@@ -220,8 +219,8 @@ constexpr M_Ratio M_RatioOf(std::integral auto whole) {
 }
 
 /// The ratio that a text is from beginning to end: "30000/1001", as it stands; "25"; or "23.976",
-/// exactly and in lowest terms. A sign may come first. Nothing for any other text, a den of 0, and
-/// what does not fit.
+/// exactly and in lowest terms. A sign may come first. Nothing for any other text, a den of 0, more
+/// than 19 digits, and what does not fit.
 constexpr std::optional<M_Ratio> M_ParseRatio(std::string_view text) {
   const bool isNegative = !text.empty() && text[0] == '-';
   if (isNegative || (!text.empty() && text[0] == '+')) text.remove_prefix(1);
@@ -253,14 +252,10 @@ constexpr std::optional<M_Ratio> M_ParseRatio(std::string_view text) {
                  static_cast<uint32_t>(parts[1])};
 }
 
-/// `using namespace M_Literals;` gives "30000/1001"_ratio, which does not compile where
-/// M_ParseRatio() gives nothing.
-inline namespace M_Literals {
-/// As M_ParseRatio().
+/// "30000/1001"_ratio, as M_ParseRatio(); where that gives nothing it does not compile.
 consteval M_Ratio operator""_ratio(const char* text, size_t size) {
   return M_ParseRatio(std::string_view(text, size)).value();
 }
-}  // namespace M_Literals
 
 /// Writes "30000/1001", or "25" where den is 1; M_ParseRatio() reads it back. As std::to_chars().
 /// 22 chars are enough.

@@ -12,8 +12,6 @@
 
 namespace {
 
-using comp::Seconds;
-
 TEST(Timecode, DropsTwoOrFourNumbersOfEachMinuteButTheTenth) {
   for (const M_Ratio rate : {M_Ratio{30000, 1001}, {60000, 1001}}) {
     const int base = rate.num / 1000;
@@ -114,6 +112,23 @@ TEST(Otio, TracksAreSummedExactly) {
     EXPECT_THROW(comp::ReadOtio(text.substr(0, size), "file"), comp::InputError);
   }
   EXPECT_THROW(comp::ReadOtio(R"({"OTIO_SCHEMA": "Marker.2"})", "file"), comp::InputError);
+  EXPECT_THROW(comp::ReadOtio(text + std::string(2000, '['), "file"), comp::InputError);
+}
+
+TEST(Otio, TrimmedTracksHoldWhatIsInTheTrim) {
+  const std::string clip =
+      R"({"OTIO_SCHEMA": "Clip.1", "source_range": )" + Range("5", "10", "24") +
+      R"(, "effects": [{"OTIO_SCHEMA": "LinearTimeWarp.1", "time_scalar": 2}]})";
+  const std::string text = R"({"OTIO_SCHEMA": "Track.1", "source_range": )" +
+                           Range("12", "20", "24") + R"(, "children": [)" + clip + ',' + clip +
+                           ',' + clip + ',' + clip + ',' + clip + "]}";
+  const auto items = comp::ReadOtio(text, "file").at(0).tracks.at(0).items;
+  ASSERT_EQ(items.size(), 3u);
+  EXPECT_TRUE(items[0].recordIn.ratio == (M_Ratio{0, 1}) &&
+              items[0].sourceIn.ratio == (M_Ratio{9, 24}));
+  EXPECT_EQ(items[1].recordIn.ratio, (M_Ratio{8, 24}));
+  EXPECT_TRUE(items[2].recordOut.ratio == (M_Ratio{20, 24}) &&
+              items[2].sourceOut.ratio == (M_Ratio{9, 24}));
 }
 
 }  // namespace

@@ -20,11 +20,10 @@ using F2 = M_Vector2T<float>;
 py::ssize_t Columns(const py::array& array) { return array.ndim() == 2 ? array.shape(1) : 0; }
 
 template <class Record, class Number, class Matrix>
-void TransformRows(py::array& points, const Matrix& matrix,
-                   int32_t (*transform)(const Matrix*, int32_t, Record*)) {
+void TransformRows(py::array& points, const Matrix& matrix) {
   const std::span<Record> rows = RowsToChange<Record, Number>(points, "points");
   const py::gil_scoped_release released;
-  M_OpsDetail::TransformAll(transform, matrix, rows);
+  M_Transform(rows, matrix);
 }
 
 // With x and y exchanged, for records that have them the other way round.
@@ -35,18 +34,18 @@ M_Matrix3 Exchanged(const M_Matrix3& m) {
 
 void Transform3(py::array points, const M_Matrix3& m) {
   if (py::isinstance<py::array_t<int16_t>>(points)) {
-    return TransformRows<M_Point, int16_t>(points, Exchanged(m), M_TransformPoints);
+    return TransformRows<M_Point, int16_t>(points, Exchanged(m));
   }
   if (py::isinstance<py::array_t<int32_t>>(points)) {
-    return TransformRows<M_FixedPoint, int32_t>(points, m, M_TransformFixPoints);
+    return TransformRows<M_FixedPoint, int32_t>(points, m);
   }
-  if (Columns(points) == 3) return TransformRows<V3, double>(points, m, M_TransformVector3);
-  TransformRows<V2, double>(points, m, M_TransformFloatPoints);
+  if (Columns(points) == 3) return TransformRows<V3, double>(points, m);
+  TransformRows<V2, double>(points, m);
 }
 
 void Transform4(py::array points, const M_Matrix4& m) {
-  if (Columns(points) == 4) return TransformRows<V4, double>(points, m, M_TransformVector4);
-  TransformRows<V3, double>(points, m, M_Transform3DFloatPoints);
+  if (Columns(points) == 4) return TransformRows<V4, double>(points, m);
+  TransformRows<V3, double>(points, m);
 }
 
 template <class Point, class Number>
@@ -131,8 +130,8 @@ void BindArrays(py::module_& m) {
         "Takes the rows of an array through a matrix, in place.\n\n"
         "With a Matrix3: (n, 2) points of float64; (n, 3) homogeneous vectors of float64, not "
         "divided; (n, 2) points of int16, or of int32 in 16.16, rounded to nearest: on an "
-        "OverflowError those before it are done. With a Matrix4: (n, 3) points or (n, 4) "
-        "homogeneous ones of float64, divided by their w. Columns are x, y, z, w.");
+        "OverflowError those before it are done. With a Matrix4: (n, 3) points of float64, "
+        "divided by their w, or (n, 4) homogeneous ones, which are not. Columns are x, y, z, w.");
   m.def("transform", &Transform4, py::arg("points"), py::arg("matrix"));
   m.def("points_in_polygon", &InPolygon, py::arg("points"), py::arg("polygon"),
         py::arg("tolerance") = 0.0,

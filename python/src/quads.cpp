@@ -29,37 +29,42 @@ int InRange(int index) {
   return index;
 }
 
+// What both kinds have.
+template <class Quad>
+py::class_<Quad> BindQuad(py::module_& m, const char* name, const char* doc) {
+  return py::class_<Quad>(m, name, doc)
+      .def(
+          "is_point_inside",
+          [](const Quad& quad, const std::pair<double, double>& point, double tolerance) {
+            const V2 p = ToPoint(point);
+            return quad.IsPointInside(&p, tolerance);
+          },
+          py::arg("point"), py::arg("tolerance") = 0.0,
+          "Whether a point is inside, or at most the tolerance away.")
+      .def(
+          "minimum_edge_distance",
+          [](const Quad& quad, const std::pair<double, double>& point) {
+            const V2 p = ToPoint(point);
+            return quad.GetMinimumEdgeDistance(&p);
+          },
+          py::arg("point"), "From the nearest visible edge; -1 if there is none.");
+}
+
 }  // namespace
 
 void BindQuads(py::module_& m) {
   using Quad2 = M_TransformPoly2D;
   using Quad3 = M_TransformPoly3D;
-  const char* const kInside = "Whether a point is inside, or at most the tolerance away.";
-  const char* const kDistance = "From the nearest visible edge; -1 if there is none.";
-  py::class_<Quad2>(m, "TransformPoly2D", "A quad in the plane of the screen.")
+  BindQuad<Quad2>(m, "TransformPoly2D", "A quad in the plane of the screen.")
       .def(py::init([](const py::array& corners) {
              Quad2 quad;
              SetCorners<Quad2, V2>(&quad, corners);
              return quad;
            }),
            py::arg("corners"), "From a (4, 2) array of float64.")
-      .def_readwrite("visible", &Quad2::visible, "Whether points may be inside.")
-      .def(
-          "is_point_inside",
-          [](const Quad2& quad, const std::pair<double, double>& point, double tolerance) {
-            const V2 p = ToPoint(point);
-            return quad.IsPointInside(&p, tolerance);
-          },
-          py::arg("point"), py::arg("tolerance") = 0.0, kInside)
-      .def(
-          "minimum_edge_distance",
-          [](const Quad2& quad, const std::pair<double, double>& point) {
-            const V2 p = ToPoint(point);
-            return quad.GetMinimumEdgeDistance(&p);
-          },
-          py::arg("point"), kDistance);
-  py::class_<Quad3>(m, "TransformPoly3D",
-                    "A quad in space: to_eye(), to_screen(), and then what of it is seen.")
+      .def_readwrite("visible", &Quad2::visible, "Whether points may be inside.");
+  BindQuad<Quad3>(m, "TransformPoly3D",
+                  "A quad in space: to_eye(), to_screen(), and then what of it is seen.")
       .def(py::init([](const py::array& corners) {
              auto quad = std::make_unique<Quad3>();
              SetCorners<Quad3, V3>(quad.get(), corners);
@@ -100,21 +105,7 @@ void BindQuads(py::module_& m) {
             if (!quad.GetEdge(InRange(edge), &ends)) return py::none();
             return py::make_tuple(ToPair(ends.first), ToPair(ends.second));
           },
-          py::arg("edge"), "Both ends of what is seen of an edge, or None.")
-      .def(
-          "is_point_inside",
-          [](const Quad3& quad, const std::pair<double, double>& point, double tolerance) {
-            const V2 p = ToPoint(point);
-            return quad.IsPointInside(&p, tolerance);
-          },
-          py::arg("point"), py::arg("tolerance") = 0.0, kInside)
-      .def(
-          "minimum_edge_distance",
-          [](const Quad3& quad, const std::pair<double, double>& point) {
-            const V2 p = ToPoint(point);
-            return quad.GetMinimumEdgeDistance(&p);
-          },
-          py::arg("point"), kDistance);
+          py::arg("edge"), "Both ends of what is seen of an edge, or None.");
 }
 
 }  // namespace m_math

@@ -1,6 +1,7 @@
 // Ratios beside Python's own numbers, and frames.
 
 #include <cmath>
+#include <numeric>
 #include <optional>
 #include <sstream>
 #include <string>
@@ -32,7 +33,10 @@ py::object ToFraction(const M_Ratio& r) {
   return py::reinterpret_borrow<py::object>(fractionType)(r.num, r.den);
 }
 
-M_Ratio Lowest(const M_Ratio& r) { return M_OpsDetail::Product(r, {1, 1}).ToRatio().value_or(r); }
+M_Ratio Lowest(const M_Ratio& r) {
+  const int64_t gcd = std::gcd(int64_t{r.num}, int64_t{r.den});
+  return {static_cast<int32_t>(r.num / gcd), static_cast<uint32_t>(r.den / gcd)};
+}
 
 // A whole number, or one that is certainly too large.
 int64_t ToInt(const py::handle& value) {
@@ -46,10 +50,11 @@ int64_t ToInt(const py::handle& value) {
 
 M_Ratio FromParts(const py::handle& num, const py::handle& den) {
   int64_t n = ToInt(num), d = ToInt(den);
-  if (d == 0) M_OpsDetail::FailZeroDenominator(M_MulRatio);
+  if (d == 0) return M_Ratio{1, 1} / M_Ratio{0, 1};  // Throws.
   if (d < 0) n = -n, d = -d;
-  if (!std::in_range<int32_t>(n) || !std::in_range<uint32_t>(d)) M_OpsDetail::FailAs(M_MulRatio);
-  return {static_cast<int32_t>(n), static_cast<uint32_t>(d)};
+  // Throws, too, for what does not fit.
+  const M_Ratio whole = M_RatioOf(std::in_range<uint32_t>(d) ? n : INT64_MAX);
+  return {whole.num, static_cast<uint32_t>(d)};
 }
 
 // A number of one of the kinds that are exact, or nothing.
@@ -167,7 +172,7 @@ PyObject* Approximate(PyObject*, PyObject* number) {
     M_Ratio ratio;
     unsigned char isOutOfRange;
     M_FpLong2Ratio(&ratio, &isOutOfRange, value);
-    if (isOutOfRange) M_OpsDetail::FailAs(M_MulRatio);
+    if (isOutOfRange) ratio = M_RatioOf(INT64_MAX);  // Throws.
     const bool isExact = std::fma(value, ratio.den, -1.0 * ratio.num) == 0;
     return py::make_tuple(ratio, isExact).release().ptr();
   });
@@ -272,9 +277,9 @@ PyObject* MakeType() {
          return PyFloat_FromDouble(ValueOf(self).num / static_cast<double>(ValueOf(self).den));
        })},
       {}};
-  PyType_Spec spec = {"m_math.Ratio", sizeof(RatioObject), 0,
-                      Py_TPFLAGS_DEFAULT | Py_TPFLAGS_IMMUTABLETYPE, slots};
-  return PyType_FromSpec(&spec);
+  PyType_Spec description = {"m_math.Ratio", sizeof(RatioObject), 0,
+                             Py_TPFLAGS_DEFAULT | Py_TPFLAGS_IMMUTABLETYPE, slots};
+  return PyType_FromSpec(&description);
 }
 
 }  // namespace

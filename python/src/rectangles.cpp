@@ -75,9 +75,8 @@ py::class_<Rect> BindRect(py::module_& m, const char* name, const char* doc) {
       });
 }
 
-template <class Rect>
+template <class Rect, class Point>
 py::class_<Rect> BindWholeRect(py::module_& m, const char* name, const char* doc) {
-  using Point = typename M_OpsDetail::Width<Rect>::Point;
   return BindRect<Rect>(m, name, doc)
       .def(
           "__eq__", [](const Rect& a, const Rect& b) { return a == b; }, py::is_operator(),
@@ -124,13 +123,15 @@ void BindRectangles(py::module_& m) {
 
   const char* const kRounding =
       "'nearest', 'in' (inside this one) or 'out' (around it), in whole pixels.";
-  auto rect = BindWholeRect<M_Rect>(m, "Rect", "A rectangle of 16 bits an edge, half-open.");
-  auto lrect = BindWholeRect<M_LRect>(m, "LRect",
-                                      "A rectangle of 32 bits an edge, half-open.\n\n"
-                                      ">>> LRect(0, 0, 4, 4) & LRect(2, 2, 9, 9)\n"
-                                      "LRect(2, 2, 4, 4)\n"
-                                      ">>> LPoint(4, 0) in LRect(0, 0, 4, 4)\nFalse");
-  auto fixed = BindWholeRect<M_FixedRect>(m, "FixedRect", "A rectangle in 16.16: 65536 is 1.");
+  auto rect =
+      BindWholeRect<M_Rect, M_Point>(m, "Rect", "A rectangle of 16 bits an edge, half-open.");
+  auto lrect = BindWholeRect<M_LRect, M_LPoint>(m, "LRect",
+                                                "A rectangle of 32 bits an edge, half-open.\n\n"
+                                                ">>> LRect(0, 0, 4, 4) & LRect(2, 2, 9, 9)\n"
+                                                "LRect(2, 2, 4, 4)\n"
+                                                ">>> LPoint(4, 0) in LRect(0, 0, 4, 4)\nFalse");
+  auto fixed =
+      BindWholeRect<M_FixedRect, M_FixedPoint>(m, "FixedRect", "A rectangle in 16.16: 65536 is 1.");
   BindRect<M_FloatRect>(m, "FloatRect", "A rectangle of floats, half-open.")
       .def(
           "__eq__",

@@ -13,8 +13,8 @@
 namespace Mp {
 
 /// Coordinates are below 2^30: three digits.
-constexpr int kDigitBits = 10;
-constexpr size_t kDigits = size_t{1} << kDigitBits;
+inline constexpr int kDigitBits = 10;
+inline constexpr size_t kDigits = size_t{1} << kDigitBits;
 
 /// A digit of x, the last one at place 0.
 inline size_t DigitOf(Key key, int place) {
