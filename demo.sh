@@ -1,11 +1,11 @@
 #!/bin/sh
-# Installs what is missing, builds, and prints the sheets of the sample compositions and draws two.
+# Installs what is missing, builds, and prints the sheets of the samples and draws three.
 set -eu
 cd "$(dirname "$0")"
 . scripts/common.sh
 
 need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libcli11-dev libgtest-dev librapidcheck-dev libbenchmark-dev pkg-config
-build_preset release --target comp M_catalogues
+build_preset release --target comp M_catalogues comp_catalogues
 echo
 build/release/bin/comp comp/samples/film.json comp/samples/broadcast.json \
   comp/samples/sound.json comp/samples/stage.json comp/samples/space.json comp/samples/harbour.otio

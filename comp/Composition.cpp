@@ -11,6 +11,7 @@
 #include <set>
 #include <utility>
 
+#include "Language.h"
 #include "Rates.h"
 #include "Timecode.h"
 
@@ -24,42 +25,43 @@ class Fields {
  public:
   Fields(const Json& json, std::string place, std::initializer_list<const char*> known)
       : json_(json), place_(std::move(place)) {
-    if (!json.is_object()) Complain("is not an object");
+    if (!json.is_object()) Complain(Tr("is not an object"));
     for (const auto& [key, value] : json.items()) {
       bool isKnown = false;
       for (const char* name : known) isKnown |= key == name;
-      if (!isKnown) ComplainAbout(key, "is not a field this program knows");
+      if (!isKnown) ComplainAbout(key, Tr("is not a field this program knows"));
     }
   }
 
   [[noreturn]] void Complain(const std::string& what) const {
-    throw InputError(place_ + " " + what + ".");
+    throw InputError(Tr("{0} {1}.", {place_, what}));
   }
 
   [[noreturn]] void ComplainAbout(const std::string& field, const std::string& what) const {
-    throw InputError(place_ + ", field \"" + field + "\": " + what + ".");
+    throw InputError(Tr("{0}, field \"{1}\": {2}.", {place_, field, what}));
   }
 
   bool Has(const char* field) const { return json_.contains(field); }
 
   const Json& Get(const char* field) const {
-    if (!Has(field)) ComplainAbout(field, "is missing");
+    if (!Has(field)) ComplainAbout(field, Tr("is missing"));
     return json_.at(field);
   }
 
   std::string Name() const {
     const Json& value = Get("name");
     if (!value.is_string() || value.get<std::string>().empty())
-      ComplainAbout("name", "is not a text");
+      ComplainAbout("name", Tr("is not a text"));
     return value;
   }
 
   int32_t Whole(const char* field) const {
     const Json& value = Get(field);
-    if (!value.is_number_integer()) ComplainAbout(field, value.dump() + " is not a whole number");
+    if (!value.is_number_integer())
+      ComplainAbout(field, Tr("{0} is not a whole number", {value.dump()}));
     const bool fits = value.is_number_unsigned() ? value.get<uint64_t>() <= INT32_MAX
                                                  : value.get<int64_t>() >= INT32_MIN;
-    if (!fits) ComplainAbout(field, value.dump() + " has more than 32 bits");
+    if (!fits) ComplainAbout(field, Tr("{0} has more than 32 bits", {value.dump()}));
     return value;
   }
 
@@ -69,7 +71,7 @@ class Fields {
     if (!value.is_string()) return Whole(field);
     const auto frame = ParseTimecode(value.get<std::string>(), rate);
     if (!frame || !std::in_range<int32_t>(*frame)) {
-      ComplainAbout(field, value.dump() + " is no timecode of this rate");
+      ComplainAbout(field, Tr("{0} is no timecode of this rate", {value.dump()}));
     }
     return static_cast<int32_t>(*frame);
   }
@@ -78,15 +80,15 @@ class Fields {
   GivenRatio Ratio(const char* field, bool isFrameRate) const {
     const Json& value = Get(field);
     if (value.is_number()) return FromNumber(field, value.dump(), isFrameRate);
-    if (!value.is_string()) ComplainAbout(field, "is neither a number nor a ratio");
+    if (!value.is_string()) ComplainAbout(field, Tr("is neither a number nor a ratio"));
     const std::string text = value;
     const size_t slash = text.find('/');
     if (slash == std::string::npos) return FromNumber(field, text, isFrameRate);
     const auto num = Parse<int32_t>(text.substr(0, slash));
     const auto den = Parse<int32_t>(text.substr(slash + 1));
-    if (!num || !den) ComplainAbout(field, "\"" + text + "\" is not a ratio of 32-bit numbers");
-    if (*den == 0) ComplainAbout(field, "\"" + text + "\" has a zero denominator");
-    if (*num <= 0 || *den < 0) ComplainAbout(field, "\"" + text + "\" is not greater than zero");
+    if (!num || !den) ComplainAbout(field, Tr("\"{0}\" is not a ratio of 32-bit numbers", {text}));
+    if (*den == 0) ComplainAbout(field, Tr("\"{0}\" has a zero denominator", {text}));
+    if (*num <= 0 || *den < 0) ComplainAbout(field, Tr("\"{0}\" is not greater than zero", {text}));
     return {{*num, static_cast<uint32_t>(*den)}, {}};
   }
 
@@ -117,14 +119,15 @@ class Fields {
   // An object in a field, or in the list of one.
   Fields Sub(const char* field, const Json& json, const std::string& what,
              std::initializer_list<const char*> known) const {
-    return {json, place_ + ", field \"" + field + "\"" + what, known};
+    return {json, Tr("{0}, field \"{1}\"", {place_, field}) + what, known};
   }
 
   Size Pixels(const char* field) const {
     const auto length = [&](const Json& value) {
       constexpr int32_t kMost = 30000;
       const bool isLength = value.is_number_integer() && value > 0 && value <= kMost;
-      if (!isLength) ComplainAbout(field, value.dump() + " is not a whole number from 1 to 30000");
+      if (!isLength)
+        ComplainAbout(field, Tr("{0} is not a whole number from 1 to 30000", {value.dump()}));
       return value.get<int32_t>();
     };
     const Json& list = List(field, 2);
@@ -135,13 +138,13 @@ class Fields {
   const Json& List(const char* field, size_t count) const {
     const Json& list = Get(field);
     if (!list.is_array() || list.size() != count) {
-      ComplainAbout(field, "is not a list of " + std::to_string(count) + " numbers");
+      ComplainAbout(field, Tr("is not a list of {0} numbers", {std::to_string(count)}));
     }
     return list;
   }
 
   double ToNumber(const char* field, const Json& value) const {
-    if (!value.is_number()) ComplainAbout(field, value.dump() + " is not a number");
+    if (!value.is_number()) ComplainAbout(field, Tr("{0} is not a number", {value.dump()}));
     return value;
   }
 
@@ -156,11 +159,13 @@ class Fields {
 
   GivenRatio FromNumber(const char* field, const std::string& text, bool isFrameRate) const {
     const auto value = Parse<double>(text);
-    if (!value || !std::isfinite(*value)) ComplainAbout(field, "\"" + text + "\" is not a number");
-    if (*value <= 0) ComplainAbout(field, text + " is not greater than zero");
+    if (!value || !std::isfinite(*value))
+      ComplainAbout(field, Tr("\"{0}\" is not a number", {text}));
+    if (*value <= 0) ComplainAbout(field, Tr("{0} is not greater than zero", {text}));
     const auto decimal = ToRatio(text, isFrameRate);
     // 0 for what is too small.
-    if (!decimal || decimal->ratio.num == 0) ComplainAbout(field, text + " is out of range");
+    if (!decimal || decimal->ratio.num == 0)
+      ComplainAbout(field, Tr("{0} is out of range", {text}));
     return {decimal->ratio, decimal->isExact ? "" : text};
   }
 
@@ -181,7 +186,7 @@ Orientation ReadOrientation(const Fields& fields) {
     return {Kind::kAxis, {axis[0], axis[1], axis[2], fields.Number("angle")}};
   }
   if (fields.Has("quaternion")) return {Kind::kQuaternion, fields.Numbers<4>("quaternion")};
-  fields.Complain("has neither \"angles\" nor an \"axis\" nor a \"quaternion\"");
+  fields.Complain(Tr("has neither \"angles\" nor an \"axis\" nor a \"quaternion\""));
 }
 
 constexpr auto kOrientationFields = {"angles", "axis", "angle", "quaternion"};
@@ -189,7 +194,8 @@ constexpr auto kKeyFields = {"frame", "angles", "axis", "angle", "quaternion"};
 
 SpacePlacement ReadSpacePlacement(const Fields& fields) {
   if (fields.Has("rotation")) {
-    fields.ComplainAbout("rotation", "is for layers in the frame; in space it is \"orientation\"");
+    fields.ComplainAbout("rotation",
+                         Tr("is for layers in the frame; in space it is \"orientation\""));
   }
   SpacePlacement placement = {};
   placement.size = fields.Pixels("size");
@@ -204,13 +210,13 @@ SpacePlacement ReadSpacePlacement(const Fields& fields) {
   }
   if (!fields.Has("keys")) return placement;
   const Json& keys = fields.Get("keys");
-  if (!keys.is_array() || keys.empty()) fields.ComplainAbout("keys", "is not a list of keys");
+  if (!keys.is_array() || keys.empty()) fields.ComplainAbout("keys", Tr("is not a list of keys"));
   for (const Json& json : keys) {
-    const std::string what = ", key " + std::to_string(placement.keys.size() + 1);
+    const std::string what = Tr(", key {0}", {std::to_string(placement.keys.size() + 1)});
     const Fields key = fields.Sub("keys", json, what, kKeyFields);
     const int32_t frame = key.Whole("frame");
     if (!placement.keys.empty() && frame <= placement.keys.back().frame) {
-      key.ComplainAbout("frame", "does not lie behind that of the key before");
+      key.ComplainAbout("frame", Tr("does not lie behind that of the key before"));
     }
     placement.keys.push_back({frame, ReadOrientation(key)});
   }
@@ -219,7 +225,7 @@ SpacePlacement ReadSpacePlacement(const Fields& fields) {
 
 Placement ReadPlacement(const Fields& fields, const Size& frame) {
   for (const char* field : {"orientation", "keys"}) {
-    if (fields.Has(field)) fields.ComplainAbout(field, "needs a \"position\" of three numbers");
+    if (fields.Has(field)) fields.ComplainAbout(field, Tr("needs a \"position\" of three numbers"));
   }
   Placement placement;
   placement.size = fields.Pixels("size");
@@ -233,11 +239,11 @@ Placement ReadPlacement(const Fields& fields, const Size& frame) {
 void ReadPlace(const Fields& fields, const std::optional<Size>& frame, Layer* layer) {
   if (!fields.Has("size")) {
     for (const char* field : {"anchor", "position", "scale", "rotation", "orientation", "keys"}) {
-      if (fields.Has(field)) fields.ComplainAbout(field, "places a layer that has no \"size\"");
+      if (fields.Has(field)) fields.ComplainAbout(field, Tr("places a layer that has no \"size\""));
     }
     return;
   }
-  if (!frame) fields.ComplainAbout("size", "needs a composition that has a \"size\"");
+  if (!frame) fields.ComplainAbout("size", Tr("needs a composition that has a \"size\""));
   if (fields.HasTriple("position")) {
     layer->space = ReadSpacePlacement(fields);
   } else {
@@ -257,15 +263,15 @@ Camera ReadCamera(const Fields& fields, const Size& frame) {
   camera.target = given.Triple("target");
   if (given.Has("up")) camera.up = given.Triple("up");
   if (given.Has("zoom")) camera.zoom = given.Number("zoom");
-  if (camera.zoom <= 0) given.ComplainAbout("zoom", "is not greater than zero");
+  if (camera.zoom <= 0) given.ComplainAbout("zoom", Tr("is not greater than zero"));
   return camera;
 }
 
 Layer ReadLayer(const Json& json, const std::string& fileName, size_t number,
                 const std::optional<Size>& frame) {
-  std::string place = fileName + ": layer " + std::to_string(number);
+  std::string place = Tr("{0}: layer {1}", {fileName, std::to_string(number)});
   if (json.contains("name") && json["name"].is_string()) {
-    place += " (\"" + json["name"].get<std::string>() + "\")";
+    place += Tr(" (\"{0}\")", {json["name"].get<std::string>()});
   }
   const Fields fields(json, place,
                       {"name", "sourceRate", "timeBase", "in", "out", "stretch", "size", "anchor",
@@ -274,15 +280,15 @@ Layer ReadLayer(const Json& json, const std::string& fileName, size_t number,
   layer.name = fields.Name();
   layer.hasSourceRate = fields.Has("sourceRate");
   if (layer.hasSourceRate && fields.Has("timeBase")) {
-    fields.ComplainAbout("timeBase", "stands beside a \"sourceRate\"");
+    fields.ComplainAbout("timeBase", Tr("stands beside a \"sourceRate\""));
   }
   layer.timeBase =
       layer.hasSourceRate ? fields.Ratio("sourceRate", true) : fields.Ratio("timeBase", false);
   layer.in = fields.Whole("in");
   layer.out = fields.Whole("out");
-  if (layer.out < layer.in) fields.ComplainAbout("out", "lies before \"in\"");
+  if (layer.out < layer.in) fields.ComplainAbout("out", Tr("lies before \"in\""));
   if (int64_t{layer.out} - layer.in > INT32_MAX) {
-    fields.ComplainAbout("out", "lies more than 32 bits behind \"in\"");
+    fields.ComplainAbout("out", Tr("lies more than 32 bits behind \"in\""));
   }
   layer.stretch = fields.Has("stretch") ? fields.Ratio("stretch", false) : GivenRatio{{1, 1}, {}};
   ReadPlace(fields, frame, &layer);
@@ -315,13 +321,14 @@ class Parser : public nlohmann::detail::json_sax_dom_parser<Json> {
   }
   bool key(std::string& name) {
     field = name;
-    if (!keys_.back().insert(name).second) return Complain("comes twice");
+    if (!keys_.back().insert(name).second) return Complain(Tr("comes twice"));
     return Base::key(name);
   }
   template <class Error>
   bool parse_error(std::size_t at, const std::string&, const Error& error) {
     byte = at - std::min<size_t>(at, 1);
-    return Complain(error.id == 406 ? "a number is too large" : "is not JSON, or ends too soon");
+    return Complain(error.id == 406 ? Tr("a number is too large")
+                                    : Tr("is not JSON, or ends too soon"));
   }
 
   std::string complaint;  // Empty unless something is wrong.
@@ -345,7 +352,7 @@ std::string Place(const std::string& text, size_t byte) {
   const std::string_view before = std::string_view(text).substr(0, byte);
   const auto lines = std::count(before.begin(), before.end(), '\n');
   const size_t column = before.size() - (lines == 0 ? 0 : before.rfind('\n') + 1);
-  return " (line " + std::to_string(lines + 1) + ", column " + std::to_string(column + 1) + ")";
+  return Tr(" (line {0}, column {1})", {std::to_string(lines + 1), std::to_string(column + 1)});
 }
 
 }  // namespace
@@ -356,27 +363,28 @@ Composition ReadComposition(std::istream& in, const std::string& fileName) {
   Parser parser(&json);
   Json::sax_parse(text, &parser);
   if (!parser.complaint.empty()) {
-    std::string place =
-        parser.layer == 0 ? ": composition" : ": layer " + std::to_string(parser.layer);
-    if (!parser.field.empty()) place += ", at or behind field \"" + parser.field + "\"";
-    throw InputError(fileName + place + ": " + parser.complaint + Place(text, parser.byte) + ".");
+    std::string place = parser.layer == 0
+                            ? Tr("{0}: composition", {fileName})
+                            : Tr("{0}: layer {1}", {fileName, std::to_string(parser.layer)});
+    if (!parser.field.empty()) place += Tr(", at or behind field \"{0}\"", {parser.field});
+    throw InputError(Tr("{0}: {1}{2}.", {place, parser.complaint, Place(text, parser.byte)}));
   }
-  const Fields fields(json, fileName + ": composition",
+  const Fields fields(json, Tr("{0}: composition", {fileName}),
                       {"name", "frameRate", "start", "duration", "size", "camera", "layers"});
   Composition composition;
   composition.name = fields.Name();
   composition.frameRate = fields.Ratio("frameRate", true);
   composition.start = fields.Start("start", composition.frameRate.ratio);
   composition.duration = fields.Whole("duration");
-  if (composition.duration <= 0) fields.ComplainAbout("duration", "is not greater than zero");
+  if (composition.duration <= 0) fields.ComplainAbout("duration", Tr("is not greater than zero"));
   if (fields.Has("size")) {
     composition.size = fields.Pixels("size");
     composition.camera = ReadCamera(fields, *composition.size);
   } else if (fields.Has("camera")) {
-    fields.ComplainAbout("camera", "needs a composition that has a \"size\"");
+    fields.ComplainAbout("camera", Tr("needs a composition that has a \"size\""));
   }
   const Json& layers = fields.Get("layers");
-  if (!layers.is_array()) fields.ComplainAbout("layers", "is not a list");
+  if (!layers.is_array()) fields.ComplainAbout("layers", Tr("is not a list"));
   for (const Json& layer : layers) {
     composition.layers.push_back(
         ReadLayer(layer, fileName, composition.layers.size() + 1, composition.size));

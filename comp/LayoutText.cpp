@@ -1,8 +1,9 @@
 #include "LayoutText.h"
 
-#include <cstdio>
 #include <nlohmann/json.hpp>
 
+#include "Language.h"
+#include "Text.h"
 #include "Wording.h"
 
 namespace comp {
@@ -13,25 +14,26 @@ using Json = nlohmann::ordered_json;
 const char* Name(uint32_t matrixType) {
   switch (matrixType) {
     case M_MATRIX_IDENTITY:
-      return "identity";
+      return Later("identity");
     case M_MATRIX_TRANSLATE:
-      return "translation";
+      return Later("translation");
     case M_MATRIX_SCALE:
-      return "scale";
+      return Later("scale");
     case M_MATRIX_SCALE_TRANSLATE:
-      return "scale and translation";
+      return Later("scale and translation");
     case M_MATRIX_AFFINE:
-      return "rotation or skew";
+      return Later("rotation or skew");
     default:
-      return "perspective";
+      return Later("perspective");
   }
 }
 
 std::string ToText(const M_LRect& r) {
-  if (M_EmptyLRect(&r)) return "nothing";
-  char text[64];
-  std::snprintf(text, sizeof text, "%d,%d to %d,%d", r.left, r.top, r.right, r.bottom);
-  return text;
+  if (M_EmptyLRect(&r)) return Tr("nothing");
+  const auto point = [](int32_t x, int32_t y) {
+    return std::to_string(x).append(",").append(std::to_string(y));
+  };
+  return Tr("{0} to {1}", {point(r.left, r.top), point(r.right, r.bottom)});
 }
 
 Json ToJson(const M_LRect& r) { return {r.left, r.top, r.right, r.bottom}; }
@@ -40,22 +42,22 @@ Json ToJson(const Size& size) { return {size.width, size.height}; }
 }  // namespace
 
 std::string ToTable(const Layout& layout) {
-  std::string text = "Frame " + ToText(layout.frame) + ", layers from the top down\n";
+  std::string text = Tr("Frame {0}, layers from the top down", {ToText(layout.frame)}) + "\n";
   for (const PlacedLayer& layer : layout.layers) {
-    text += "\nLayer \"" + Printable(layer.name) + "\", " + ToText(layer.size) + ", placed by " +
-            Name(layer.matrixType) + (layer.isInvertible ? "\n" : ", which cannot be undone\n");
-    std::string corners;
-    for (const auto& corner : layer.corners) {
-      corners.append(corners.empty() ? "" : " ").append(comp::ToText({corner.x, corner.y}));
-    }
-    text += Line("corners", corners);
-    text += Line("pixels", ToText(layer.bounds));
-    text += Line("in frame", ToText(layer.inFrame));
+    text += '\n';
+    text += Tr("Layer \"{0}\", {1}, placed by {2}",
+               {Printable(layer.name), ToText(layer.size), Tr(Name(layer.matrixType))});
+    text.append(layer.isInvertible ? "" : Tr(", which cannot be undone")).append("\n");
+    std::vector<std::string> corners;
+    for (const auto& corner : layer.corners) corners.push_back(comp::ToText({corner.x, corner.y}));
+    text += Line(Tr("corners"), corners);
+    text += Line(Tr("pixels"), {ToText(layer.bounds)});
+    text += Line(Tr("in frame"), {ToText(layer.inFrame)});
     for (const Overlap& overlap : layer.overlaps) {
-      text += Line("over \"" + Printable(overlap.name) + "\"", ToText(overlap.rect));
+      text += Line(Tr("over \"{0}\"", {Printable(overlap.name)}), {ToText(overlap.rect)});
     }
   }
-  return text + "\nAll layers: " + ToText(layout.all) + "\n";
+  return text.append("\n").append(Tr("All layers: {0}", {ToText(layout.all)})).append("\n");
 }
 
 nlohmann::ordered_json ToJson(const Layout& layout) {

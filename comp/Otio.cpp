@@ -6,8 +6,11 @@
 #include <cstdlib>
 #include <nlohmann/json.hpp>
 #include <optional>
+#include <set>
+#include <utility>
 
 #include "Composition.h"
+#include "Language.h"
 #include "M_Ops.h"
 #include "Rates.h"
 
@@ -43,7 +46,7 @@ std::string WithoutOddNumbers(const std::string& text, const std::string& fileNa
       plain += isName || isTooLarge ? "null" : token;
     } else {
       depth += c == '{' || c == '[' ? 1 : c == '}' || c == ']' ? -1 : 0;
-      if (depth > 1000) throw InputError(fileName + ": is nested too deeply.");
+      if (depth > 1000) throw InputError(Tr("{0}: is nested too deeply.", {fileName}));
       plain += c;
     }
     i = end;
@@ -71,7 +74,7 @@ class Reader {
     } else if (IsA(root, "Stack") || IsItem(root) || IsA(root, "Track")) {
       timelines.push_back(ReadTracks(root, root));
     }
-    if (timelines.empty()) throw InputError(fileName_ + ": there is no timeline in it.");
+    if (timelines.empty()) throw InputError(Tr("{0}: there is no timeline in it.", {fileName_}));
     return timelines;
   }
 
@@ -105,8 +108,7 @@ class Reader {
   }
 
   void Remark(const std::string& text) {
-    auto& remarks = timeline_.remarks;
-    if (std::find(remarks.begin(), remarks.end(), text) == remarks.end()) remarks.push_back(text);
+    if (remarks_.insert(text).second) timeline_.remarks.push_back(text);
   }
 
   std::optional<M_Ratio> Rate(const Json& time) {
@@ -116,7 +118,8 @@ class Reader {
     // Neither may be more than a num holds: a frame is its reciprocal.
     if (!ratio || ratio->ratio.num <= 0 || ratio->ratio.den > INT32_MAX) return {};
     if (!ratio->isExact)
-      Remark("the rate " + rate.dump() + " is no ratio of 32 bits: the nearest is taken");
+      Remark(Tr("the rate {0} is no ratio of 32 bits: the nearest is taken", {rate.dump()}));
+    timeline_.rates.insert(ratio->ratio);
     return ratio->ratio;
   }
 
@@ -127,11 +130,11 @@ class Reader {
     if (!value.is_number() || !rate) return {};
     const auto count = ToRatio(value.dump(), false);
     if (!count) {
-      Remark("the time " + value.dump() + " does not fit");
+      Remark(Tr("the time {0} does not fit", {value.dump()}));
       return Seconds{{0, 0}, false};
     }
     const M_Ratio frame = {static_cast<int32_t>(rate->den), static_cast<uint32_t>(rate->num)};
-    return Seconds{count->ratio, count->isExact} * frame;
+    return Seconds{count->ratio, count->isExact, count->error} * Seconds{frame};
   }
 
   std::optional<Range> ReadRange(const Json& range) {
@@ -155,7 +158,7 @@ class Reader {
     if (const auto given = ReadRange(Get(item, "source_range"))) return *given;
     if (IsA(item, "Clip")) {
       if (const auto available = ReadRange(Get(Medium(item), "available_range"))) return *available;
-      Remark("\"" + Name(item) + "\" does not say how long it is");
+      Remark(Tr("\"{0}\" does not say how long it is", {Name(item)}));
       return {};
     }
     if (IsA(item, "Timeline")) return Trimmed(Get(item, "tracks"));
@@ -172,21 +175,51 @@ class Reader {
     return all;
   }
 
-  M_Ratio Speed(const Json& item) {
-    M_Ratio speed = {1, 1};
+  // Of the medium's picture.
+  static std::optional<M_Vector2T<double>> PictureSize(const Json& clip) {
+    const Json& bounds = Get(Medium(clip), "available_image_bounds");
+    const auto number = [&](const char* corner, const char* axis) {
+      const Json& value = Get(Get(bounds, corner), axis);
+      return value.is_number() ? value.get<double>() : NAN;
+    };
+    const M_Vector2T<double> size = {number("max", "x") - number("min", "x"),
+                                     number("max", "y") - number("min", "y")};
+    if (!std::isfinite(size.x) || !std::isfinite(size.y)) return {};
+    return size;
+  }
+
+  // Those that begin in what is seen of an object, which is at `at` in the timeline.
+  void ReadMarkers(const Json& json, const Range& seen, const Seconds& at,
+                   std::vector<Marker>* markers) {
+    for (const Json& marker : List(json, "markers")) {
+      const auto range = ReadRange(Get(marker, "marked_range"));
+      if (!range) continue;
+      const Seconds offset = range->start - seen.start, in = at + offset;
+      if (offset < Seconds() || !(offset < seen.duration)) continue;
+      const Json& color = Get(marker, "color");
+      markers->push_back({Name(marker), color.is_string() ? color.get<std::string>() : "", in,
+                          in + range->duration});
+    }
+  }
+
+  // Seconds of the source a second.
+  Seconds Speed(const Json& item) {
+    Seconds speed = {{1, 1}};
     for (const Json& effect : List(item, "effects")) {
       if (IsA(effect, "FreezeFrame")) {
-        speed = {0, 1};
+        speed = {{0, 1}};
       } else if (IsA(effect, "LinearTimeWarp")) {
         const Json& scalar = Get(effect, "time_scalar");
         const auto factor = ToRatio(scalar.is_number() ? scalar.dump() : "", false);
-        const Seconds product = Seconds{speed, true} * (factor ? factor->ratio : M_Ratio{1, 1});
-        if (!factor || !factor->isExact || !product.isExact) {
-          Remark("the speed of \"" + Name(item) + "\" is not exact");
+        const Seconds product = factor
+                                    ? speed * Seconds{factor->ratio, factor->isExact, factor->error}
+                                    : Seconds{{0, 0}};
+        if (!factor || !product.isExact) {
+          Remark(Tr("the speed of \"{0}\" is not exact", {Name(item)}));
         }
-        if (product.IsKnown()) speed = product.ratio;
+        if (product.IsKnown()) speed = product;
       } else if (!IsA(effect, "Effect") && !Get(effect, "OTIO_SCHEMA").is_null()) {
-        Remark("an effect " + Get(effect, "OTIO_SCHEMA").dump() + " is passed over");
+        Remark(Tr("an effect {0} is passed over", {Get(effect, "OTIO_SCHEMA").dump()}));
       }
     }
     return speed;
@@ -206,11 +239,11 @@ class Reader {
         if (!(Seconds() < item.recordOut) || !(item.recordIn < trim->duration)) return;
         if (Seconds() < before) {
           item.recordIn = Seconds();
-          item.sourceIn = item.sourceIn + before * item.speed;
+          item.sourceIn = item.sourceIn + before * Seconds{item.speed};
         }
         if (Seconds() < behind) {
           item.recordOut = trim->duration;
-          item.sourceOut = item.sourceOut - behind * item.speed;
+          item.sourceOut = item.sourceOut - behind * Seconds{item.speed};
         }
       }
       track.items.push_back(std::move(item));
@@ -219,24 +252,37 @@ class Reader {
       if (IsA(child, "Transition")) {
         const Seconds in = Time(Get(child, "in_offset")).value_or(Seconds());
         const Seconds out = Time(Get(child, "out_offset")).value_or(Seconds());
-        add({Item::Kind::kTransition, Name(child), at - in, at + out, Seconds() - in, out, {1, 1}});
+        add({Item::Kind::kTransition,
+             Name(child),
+             at - in,
+             at + out,
+             Seconds() - in,
+             out,
+             {1, 1},
+             {}});
         continue;
       }
       const bool isNested = IsA(child, "Stack") || IsTrack(child) || IsA(child, "Timeline");
       if (!IsItem(child) && !isNested) {
-        Remark("an object " + Get(child, "OTIO_SCHEMA").dump() + " is passed over");
+        Remark(Tr("an object {0} is passed over", {Get(child, "OTIO_SCHEMA").dump()}));
         continue;
       }
       const Range range = Trimmed(child);
-      const M_Ratio speed = Speed(child);
+      const Seconds speed = Speed(child);
       const Item::Kind itemKind = isNested             ? Item::Kind::kStack
                                   : IsA(child, "Clip") ? Item::Kind::kClip
                                                        : Item::Kind::kGap;
       const Seconds end = at + range.duration, sourceEnd = range.start + range.duration * speed;
-      add({itemKind, Name(child), at, end, range.start, sourceEnd, speed});
+      add({itemKind, Name(child), at, end, range.start, sourceEnd, speed.ratio,
+           PictureSize(child)});
+      ReadMarkers(child, range, at, &track.markers);
       at = end;
     }
     track.duration = trim ? trim->duration : at;
+    std::erase_if(track.markers, [&](const Marker& marker) {
+      return marker.in < Seconds() || !(marker.in < track.duration);
+    });
+    ReadMarkers(json, {trim ? trim->start : Seconds(), track.duration}, Seconds(), &track.markers);
     return track;
   }
 
@@ -266,13 +312,14 @@ class Reader {
 
   Timeline ReadTracks(const Json& json, const Json& tracks) {
     timeline_ = {};
+    remarks_.clear();
     timeline_.name = Name(json);
     const Json& start = Get(json, "global_start_time");
     timeline_.start = Time(start).value_or(Seconds());
     const auto rate = Rate(start);
     const auto met = rate ? rate : FindRate(tracks);
     timeline_.rate = met.value_or(M_Ratio{24, 1});
-    if (!met) Remark("no rate is given: 24 frames a second are taken");
+    if (!met) Remark(Tr("no rate is given: 24 frames a second are taken"));
     const auto add = [&](const Json& child) {
       timeline_.tracks.push_back(ReadTrack(child));
       const Seconds& duration = timeline_.tracks.back().duration;
@@ -297,6 +344,7 @@ class Reader {
 
   const std::string& fileName_;
   Timeline timeline_;
+  std::set<std::string> remarks_;  // Those of the timeline, each once.
 };
 
 }  // namespace
@@ -305,7 +353,7 @@ bool IsOtio(const std::string& text) { return text.find("\"OTIO_SCHEMA\"") != st
 
 std::vector<Timeline> ReadOtio(const std::string& text, const std::string& fileName) {
   const Json root = Json::parse(WithoutOddNumbers(text, fileName), nullptr, false);
-  if (root.is_discarded()) throw InputError(fileName + ": is not JSON, or ends too soon.");
+  if (root.is_discarded()) throw InputError(Tr("{0}: is not JSON, or ends too soon.", {fileName}));
   return Reader(fileName).Read(root);
 }
 

@@ -10,6 +10,7 @@
 #include "Composition.h"
 #include "M_Matrix.h"
 #include "Reports.h"
+#include "Stage.h"
 
 namespace comp {
 
@@ -18,12 +19,6 @@ struct PictureOptions {
   std::optional<M_Vector2T<double>> point;  ///< The point that is asked for.
   double tolerance = 0;                     ///< Pixels.
   int grid = 0;                             ///< So many points a side, drawn with what they hit.
-};
-
-/// A layer under a point.
-struct Hit {
-  std::string name;
-  double distance;  ///< From the nearest visible edge, in pixels.
 };
 
 struct Picture {

@@ -86,7 +86,7 @@ std::optional<Decimal> ToRatio(std::string_view decimal, bool isRate) {
   unsigned char isOutOfRange;
   M_FpLong2Ratio(&nearest, &isOutOfRange, value);
   if (isOutOfRange) return {};
-  return Decimal{nearest, false};
+  return Decimal{nearest, false, std::abs(value - nearest.num / static_cast<double>(nearest.den))};
 }
 
 }  // namespace comp

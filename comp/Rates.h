@@ -12,7 +12,8 @@ namespace comp {
 
 struct Decimal {
   M_Ratio ratio;
-  bool isExact;  ///< It is the decimal, or the broadcast rate that it stands for.
+  bool isExact;      ///< It is the decimal, or the broadcast rate that it stands for.
+  double error = 0;  ///< How far it is from the decimal, else.
 };
 
 /// The ratio of a decimal as it is written, with an exponent or without. Where `isRate`, 23.976,

@@ -71,13 +71,44 @@ std::vector<OrientationSample> SampleAll(const std::vector<OrientationKey>& keys
   return samples;
 }
 
-SpaceLayer Place(const Layer& layer, const M_Matrix4& view) {
+}  // namespace
+
+M_Matrix4 WorldMatrix(const SpacePlacement& placement, std::optional<double> frame) {
+  M_Matrix4 m, rotation;
+  if (placement.keys.empty()) {
+    rotation = ToMatrix(placement.orientation);
+  } else if (frame) {
+    M_QuatToMatrix4(SampleAt(placement.keys, *frame).quaternion.data(), &rotation);
+  } else {
+    rotation = ToMatrix(placement.keys.front().orientation);
+  }
+  M_IdentityMatrix4(&m);
+  M_TranslateMatrix4(&m, -placement.anchor.x, -placement.anchor.y, -placement.anchor.z);
+  M_ScaleMatrix4(&m, placement.scale.x, placement.scale.y, placement.scale.z);
+  M_ConcatMatrix4(&m, &rotation, &m);
+  M_TranslateMatrix4(&m, placement.position.x, placement.position.y, placement.position.z);
+  return m;
+}
+
+M_Matrix4 MakeView(const Camera& camera) {
+  // Downwards is y here, so up is down to the library.
+  M_Matrix4 orientation =
+      M_LookAtMatrix(camera.eye, camera.target, {-camera.up.x, -camera.up.y, -camera.up.z});
+  orientation.Transpose();
+  M_Matrix4 view;
+  M_IdentityMatrix4(&view);
+  M_TranslateMatrix4(&view, -camera.eye.x, -camera.eye.y, -camera.eye.z);
+  M_ConcatMatrix4(&view, &orientation, &view);
+  return view;
+}
+
+SpaceLayer PlaceInSpace(const Layer& layer, const M_Matrix4& view, std::optional<double> frame) {
   const SpacePlacement& placement = *layer.space;
   SpaceLayer placed = {};
   placed.name = layer.name;
   placed.size = placement.size;
   placed.samples = SampleAll(placement.keys);
-  placed.matrix = WorldMatrix(placement, {});
+  placed.matrix = WorldMatrix(placement, frame);
   const M_Matrix4& m = placed.matrix;
 
   placed.isDecomposable = M_DecomposeMatrix4(&m, &placed.decomp, nullptr) == 0;
@@ -102,43 +133,12 @@ SpaceLayer Place(const Layer& layer, const M_Matrix4& view) {
   return placed;
 }
 
-// The eye at the origin, looking along z. Downwards is y here, so up is down to the library.
-M_Matrix4 MakeView(const Camera& camera) {
-  M_Matrix4 orientation =
-      M_LookAtMatrix(camera.eye, camera.target, {-camera.up.x, -camera.up.y, -camera.up.z});
-  orientation.Transpose();
-  M_Matrix4 view;
-  M_IdentityMatrix4(&view);
-  M_TranslateMatrix4(&view, -camera.eye.x, -camera.eye.y, -camera.eye.z);
-  M_ConcatMatrix4(&view, &orientation, &view);
-  return view;
-}
-
-}  // namespace
-
-M_Matrix4 WorldMatrix(const SpacePlacement& placement, std::optional<double> frame) {
-  M_Matrix4 m, rotation;
-  if (placement.keys.empty()) {
-    rotation = ToMatrix(placement.orientation);
-  } else if (frame) {
-    M_QuatToMatrix4(SampleAt(placement.keys, *frame).quaternion.data(), &rotation);
-  } else {
-    rotation = ToMatrix(placement.keys.front().orientation);
-  }
-  M_IdentityMatrix4(&m);
-  M_TranslateMatrix4(&m, -placement.anchor.x, -placement.anchor.y, -placement.anchor.z);
-  M_ScaleMatrix4(&m, placement.scale.x, placement.scale.y, placement.scale.z);
-  M_ConcatMatrix4(&m, &rotation, &m);
-  M_TranslateMatrix4(&m, placement.position.x, placement.position.y, placement.position.z);
-  return m;
-}
-
 Scene MakeScene(const Composition& composition, ReportCollector& collector) {
   Scene scene = {*composition.camera, MakeView(*composition.camera), {}};
   for (const Layer& layer : composition.layers) {
     if (!layer.space) continue;
     collector.SetLayer(layer.name);
-    scene.layers.push_back(Place(layer, scene.view));
+    scene.layers.push_back(PlaceInSpace(layer, scene.view, {}));
   }
   return scene;
 }

@@ -25,7 +25,7 @@ struct OrientationSample {
 struct SpaceLayer {
   std::string name;
   Size size;
-  M_Matrix4 matrix;     ///< From the layer to the world, at the first key.
+  M_Matrix4 matrix;     ///< From the layer to the world.
   bool isDecomposable;  ///< What follows is zero if it is not.
   M_Matrix4Decomp decomp;
   M_Vector3T<double> anglesZYX;               ///< Radians, in the other order.
@@ -43,7 +43,13 @@ struct Scene {
 /// From a layer to the world, at a frame or, without one, at the first key.
 M_Matrix4 WorldMatrix(const SpacePlacement& placement, std::optional<double> frame);
 
-/// The scene of a composition with a size.
+/// From the world to the eye, which is at the origin and looks along z.
+M_Matrix4 MakeView(const Camera& camera);
+
+/// A layer that is placed in space, at a frame or at its first key.
+SpaceLayer PlaceInSpace(const Layer& layer, const M_Matrix4& view, std::optional<double> frame);
+
+/// The scene of a composition with a size, at the first keys.
 Scene MakeScene(const Composition& composition, ReportCollector& collector);
 
 }  // namespace comp

@@ -3,6 +3,8 @@
 #include <nlohmann/json.hpp>
 #include <numbers>
 
+#include "Language.h"
+#include "Text.h"
 #include "Wording.h"
 
 namespace comp {
@@ -18,10 +20,11 @@ M_Vector3T<double> InDegrees(const M_Vector3T<double>& radians) {
 }
 
 template <class Points>
-std::string ListText(const Points& points) {
-  std::string text;
-  for (const auto& point : points) text.append(text.empty() ? "" : " ").append(ToText(point));
-  return text;
+std::vector<std::string> ListText(const Points& points) {
+  std::vector<std::string> texts;
+  texts.reserve(points.size());
+  for (const auto& point : points) texts.push_back(ToText(point));
+  return texts;
 }
 
 Json VectorJson(const M_Vector3T<double>& v) { return {v.x, v.y, v.z}; }
@@ -37,21 +40,23 @@ Json ListJson(const Points& points) {
 
 std::string ToTable(const Scene& scene) {
   const Camera& camera = scene.camera;
-  std::string text = "Space, seen from " + ToText(camera.eye) + " towards " +
-                     ToText(camera.target) + ", zoom " + ToText(camera.zoom) + "\n";
+  std::string text = Tr("Space, seen from {0} towards {1}, zoom {2}",
+                        {ToText(camera.eye), ToText(camera.target), ToText(camera.zoom)}) +
+                     "\n";
   for (const SpaceLayer& layer : scene.layers) {
     const M_Matrix4Decomp& d = layer.decomp;
-    text += "\nLayer \"" + Printable(layer.name) + "\", " + ToText(layer.size) +
-            (layer.isDecomposable ? "" : ", cannot be taken apart") + "\n";
-    text += Line("moved by", ToText(d.translate));
-    text += Line("scaled by", ToText(d.scale));
-    text += Line("sheared by", ToText({d.shear.xy, d.shear.xz, d.shear.yz}));
-    text += Line("turned by", ToText(InDegrees(d.rotate)).append(" about x, y, z"));
-    text += Line("", ToText(InDegrees(layer.anglesZYX)).append(" in the other order"));
-    text += Line("from the eye", ListText(layer.corners));
-    if (!layer.crossings.empty()) text += Line("cut at", ListText(layer.crossings));
+    text += '\n';
+    text += Tr("Layer \"{0}\", {1}", {Printable(layer.name), ToText(layer.size)}) +
+            (layer.isDecomposable ? "" : Tr(", cannot be taken apart")) + "\n";
+    text += Line(Tr("moved by"), {ToText(d.translate)});
+    text += Line(Tr("scaled by"), {ToText(d.scale)});
+    text += Line(Tr("sheared by"), {ToText({d.shear.xy, d.shear.xz, d.shear.yz})});
+    text += Line(Tr("turned by"), {ToText(InDegrees(d.rotate)), Tr("about x, y, z")});
+    text += Line("", {ToText(InDegrees(layer.anglesZYX)), Tr("in the other order")});
+    text += Line(Tr("from the eye"), ListText(layer.corners));
+    if (!layer.crossings.empty()) text += Line(Tr("cut at"), ListText(layer.crossings));
     for (const OrientationSample& sample : layer.samples) {
-      text += Line("frame " + ToText(sample.frame), ToText(sample.angles));
+      text += Line(Tr("frame {0}", {ToText(sample.frame)}), {ToText(sample.angles)});
     }
   }
   return text;

@@ -4,11 +4,10 @@
 #include <numeric>
 
 #include "M_Ops.h"
+#include "Timeline.h"
 
 namespace comp {
 namespace {
-
-using Operation = int32_t (*)(const M_Ratio*, const M_Ratio*, M_Ratio*, unsigned char*);
 
 constexpr Value kOverflown = {{0, 0}, Accuracy::kOverflow};
 
@@ -19,10 +18,16 @@ Value Calculate(Operation operation, const Value& a, const Value& b) {
   const Accuracy given = Worse(a.accuracy, b.accuracy);
   if (given == Accuracy::kOverflow) return kOverflown;
   Value result = {{}, given};
-  if (operation(&a.ratio, &b.ratio, &result.ratio, nullptr) == 0) return result;
-  unsigned char status = 2;
-  if (operation(&a.ratio, &b.ratio, &result.ratio, &status) != 0 || status != 2) return kOverflown;
-  result.accuracy = Accuracy::kApproximated;
+  if (operation(&a.ratio, &b.ratio, &result.ratio, nullptr) != 0) {
+    unsigned char status = 2;
+    if (operation(&a.ratio, &b.ratio, &result.ratio, &status) != 0 || status != 2) {
+      return kOverflown;
+    }
+    result.accuracy = Accuracy::kApproximated;
+  }
+  if (result.accuracy == Accuracy::kApproximated) {
+    result.maxError = MaxError(operation, a.ratio, a.maxError, b.ratio, b.maxError, result.ratio);
+  }
   return result;
 }
 
@@ -84,7 +89,8 @@ class SheetMaker {
   // where the composition ends.
   Value Clip(const Value& seconds) const {
     const Accuracy accuracy = Worse(seconds.accuracy, Worse(start_.accuracy, duration_.accuracy));
-    Value clipped = {{}, accuracy};
+    // What is held may not be where it seems.
+    Value clipped = {{}, accuracy, seconds.maxError + start_.maxError + duration_.maxError};
     const bool fails =
         accuracy == Accuracy::kOverflow ||
         M_ClipRatioToSpan(&seconds.ratio, &start_.ratio, &duration_.ratio, &clipped.ratio);

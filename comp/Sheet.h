@@ -26,6 +26,7 @@ enum class Accuracy {
 struct Value {
   M_Ratio ratio;
   Accuracy accuracy;
+  double maxError = 0;  ///< How far from the exact value it may be.
 };
 
 /// The frame of the composition that is nearest to a time, and whether it begins just then.

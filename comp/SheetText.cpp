@@ -2,9 +2,14 @@
 
 #include <cstdio>
 #include <nlohmann/json.hpp>
+#include <set>
 
+#include "Language.h"
 #include "LayoutText.h"
+#include "M_Ops.h"
 #include "SceneText.h"
+#include "Text.h"
+#include "Timecode.h"
 #include "Wording.h"
 
 namespace comp {
@@ -20,18 +25,19 @@ std::string Marked(bool isExact, const std::string& number) {
 }
 
 std::string ToText(const Value& value) {
-  if (value.accuracy == Accuracy::kOverflow) return "overflow";
+  if (value.accuracy == Accuracy::kOverflow) return Tr("overflow");
   return Marked(value.accuracy != Accuracy::kApproximated, ToText(value.ratio));
 }
 
 std::string ToText(const Frames& frames) {
-  return frames.hasOverflowed ? "overflow" : Marked(frames.isExact, std::to_string(frames.count));
+  return frames.hasOverflowed ? Tr("overflow")
+                              : Marked(frames.isExact, std::to_string(frames.count));
 }
 
 // A ratio and, where it stands for a decimal, that decimal.
 std::string ToText(const GivenRatio& ratio) {
   std::string text = ToText(ratio.ratio);
-  if (!ratio.given.empty()) text.append(" (approximates ").append(ratio.given).append(")");
+  if (!ratio.given.empty()) text += Tr(" (approximates {0})", {ratio.given});
   return text;
 }
 
@@ -60,19 +66,71 @@ const char* Name(Accuracy accuracy) {
   return "";
 }
 
-// Cells of a line, the first to the left, the others to the right of their columns.
-std::string Line(const std::string& label, const std::string& units, const std::string& seconds,
-                 const std::string& frames, const std::string& clipped) {
-  char cells[256];
-  std::snprintf(cells, sizeof cells, "  %-10s %12s %24s %12s %12s", label.c_str(), units.c_str(),
-                seconds.c_str(), frames.c_str(), clipped.c_str());
-  std::string line = cells;
+// Cells of a line: the first to the left, the others to the right of their columns.
+std::string Cells(const std::string& label, const std::string& units, const std::string& exact,
+                  const std::string& seconds, const std::string& frames,
+                  const std::string& timecode) {
+  std::string line = "  " + PadRight(label, 11) + PadLeft(units, 13) + PadLeft(exact, 23) +
+                     PadLeft(seconds, 20) + PadLeft(frames, 13) + PadLeft(timecode, 15);
   line.erase(line.find_last_not_of(' ') + 1);
   return line += '\n';
 }
 
+std::string Decimal(const Value& value) {
+  if (value.accuracy == Accuracy::kOverflow) return "";
+  return SecondsText(value.ratio, value.maxError);
+}
+
+std::string Timecode(const Clock& clock, const Time& time) {
+  if (time.frames.hasOverflowed) return Tr("overflow");
+  return Marked(time.frames.isExact, clock.Timecode(time.seconds.ratio));
+}
+
+std::string Cells(const Clock& clock, const std::string& label, const std::string& units,
+                  const Time& time) {
+  return Cells(label, units, ToText(time.seconds), Decimal(time.seconds), ToText(time.frames),
+               Timecode(clock, time));
+}
+
+std::string Heads(const std::string& units) {
+  return Cells("", units, Tr("exact, s"), Tr("seconds"), Tr("frames"), Tr("timecode"));
+}
+
+bool IsSame(const Value& a, const Value& b) {
+  return a.accuracy == b.accuracy && (a.accuracy == Accuracy::kOverflow || a.ratio == b.ratio);
+}
+
+// What of a row is not at its place as given.
+bool IsClipped(const Row& row) {
+  return !IsSame(row.in.seconds, row.clippedIn.seconds) ||
+         !IsSame(row.out.seconds, row.clippedOut.seconds);
+}
+
+std::string Summary(const Sheet& sheet, const Clock& clock) {
+  std::string text = Tr("Composition \"{0}\"", {Printable(sheet.name)}) + "\n  ";
+  text +=
+      Tr("{0} frames a second, {1} long, starts at {2}",
+         {ToRate(sheet.frameRate), Timecode(clock, sheet.duration), Timecode(clock, sheet.start)});
+  text += '\n';
+  std::set<std::string> rates;
+  Doubts doubts;
+  for (const Row& row : sheet.rows) {
+    rates.insert(row.hasSourceRate ? ToRate(row.timeBase) : ToText(row.timeBase) + " s");
+    for (const Time* time : {&row.in, &row.out, &row.duration}) {
+      const Accuracy accuracy = time->seconds.accuracy;
+      doubts.Add(accuracy != Accuracy::kOverflow, accuracy != Accuracy::kApproximated,
+                 time->seconds.maxError);
+    }
+  }
+  text += Line(Tr("layers"), {std::to_string(sheet.rows.size())});
+  text += Line(Tr("counted in"), Listed({rates.begin(), rates.end()}));
+  return text.append("  ").append(doubts.Text()).append("\n\n");
+}
+
 Json ToJson(const Value& value) {
-  return {{"ratio", RatioText(value.ratio)}, {"accuracy", Name(value.accuracy)}};
+  Json json = {{"ratio", RatioText(value.ratio)}, {"accuracy", Name(value.accuracy)}};
+  if (value.accuracy == Accuracy::kApproximated) json["maxError"] = value.maxError;
+  return json;
 }
 
 Json ToJson(const Time& time) {
@@ -90,41 +148,41 @@ Json ToJson(const GivenRatio& ratio) {
 
 }  // namespace
 
-std::string ToTable(const Sheet& sheet) {
-  std::string text = "Composition \"" + Printable(sheet.name) + "\", " + ToRate(sheet.frameRate) +
-                     " frames a second\n";
-  text += Line("", "units", "seconds", "frames", "");
-  text += Line("start", "", ToText(sheet.start.seconds), ToText(sheet.start.frames), "");
-  text += Line("duration", "", ToText(sheet.duration.seconds), ToText(sheet.duration.frames), "");
+std::string ToTable(const Sheet& sheet, bool mayDrop) {
+  const Clock clock(sheet.frameRate.ratio, mayDrop);
+  std::string text = Summary(sheet, clock) + Heads("");
+  text += Cells(clock, Tr("start"), "", sheet.start);
+  text += Cells(clock, Tr("duration"), "", sheet.duration);
   for (const Row& row : sheet.rows) {
-    text += "\nLayer \"" + Printable(row.name) + "\", in ";
-    text += row.hasSourceRate ? "frames of " + ToRate(row.timeBase) + " a second"
-                              : "units of " + ToText(row.timeBase) + " s";
-    text += ", stretch " + ToText(row.stretch) + '\n';
-    text += Line("", "units", "seconds", "frames", "clipped");
-    text += Line("in", std::to_string(row.inUnits), ToText(row.in.seconds), ToText(row.in.frames),
-                 ToText(row.clippedIn.frames));
-    text += Line("out", std::to_string(row.outUnits), ToText(row.out.seconds),
-                 ToText(row.out.frames), ToText(row.clippedOut.frames));
-    text +=
-        Line("duration", std::to_string(row.outUnits - row.inUnits), ToText(row.duration.seconds),
-             ToText(row.duration.frames), ToText(row.clippedDuration.frames));
-    text += Line("of source", "", ToText(row.sourceDuration), "", "");
-    text += Line("sum so far", "", ToText(row.runningSum), Name(row.runningSum.accuracy), "");
+    const std::string name = Printable(row.name);
+    text += '\n';
+    text += row.hasSourceRate ? Tr("Layer \"{0}\", in frames of {1} a second, stretch {2}",
+                                   {name, ToRate(row.timeBase), ToText(row.stretch)})
+                              : Tr("Layer \"{0}\", in units of {1} s, stretch {2}",
+                                   {name, ToText(row.timeBase), ToText(row.stretch)});
+    text += '\n' + Heads(Tr("units"));
+    text += Cells(clock, Tr("in"), std::to_string(row.inUnits), row.in);
+    text += Cells(clock, Tr("out"), std::to_string(row.outUnits), row.out);
+    text += Cells(clock, Tr("duration"), std::to_string(row.outUnits - row.inUnits), row.duration);
+    if (IsClipped(row)) {
+      text += Cells(clock, Tr("seen from"), "", row.clippedIn);
+      text += Cells(clock, Tr("seen to"), "", row.clippedOut);
+      text += Cells(clock, Tr("seen for"), "", row.clippedDuration);
+    }
+    if (!IsSame(row.sourceDuration, row.clippedDuration.seconds)) {
+      text += Cells(Tr("of source"), "", ToText(row.sourceDuration), Decimal(row.sourceDuration),
+                    "", "");
+    }
   }
-  const Value sum =
-      sheet.rows.empty() ? Value{{0, 1}, Accuracy::kExact} : sheet.rows.back().runningSum;
-  text.append("\nSum of the durations: ").append(ToText(sum));
-  if (sum.accuracy != Accuracy::kOverflow) text.append(" s, ").append(Name(sum.accuracy));
-  text += '\n';
-  text += "~ marks what is not exact: frames are rounded, ratios the nearest that fit.\n";
+  text.append("\n")
+      .append(Tr("~ marks what is not exact: frames are rounded, ratios near what does not fit."))
+      .append("\n");
   if (sheet.layout) text.append("\n").append(ToTable(*sheet.layout));
   if (sheet.scene) text.append("\n").append(ToTable(*sheet.scene));
-  if (!sheet.reports.empty()) text += "\nReported by the library:\n";
+  if (!sheet.reports.empty()) text.append("\n").append(Tr("Reported by the library:")).append("\n");
   for (const Report& report : sheet.reports) {
     text.append("  [").append(IdText(report.id)).append("] ").append(report.text);
-    if (!report.layer.empty())
-      text.append(" (layer \"").append(Printable(report.layer)).append("\")");
+    if (!report.layer.empty()) text += Tr(" (layer \"{0}\")", {Printable(report.layer)});
     text += '\n';
   }
   return text;

@@ -10,7 +10,7 @@
 namespace comp {
 
 /// A table for people.
-std::string ToTable(const Sheet& sheet);
+std::string ToTable(const Sheet& sheet, bool mayDrop);
 
 /// The same sheet as JSON, for programs.
 std::string ToJson(const Sheet& sheet);

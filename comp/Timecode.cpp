@@ -73,4 +73,16 @@ std::optional<int64_t> ParseTimecode(std::string_view text, const M_Ratio& rate)
   return isNegative ? -frame : frame;
 }
 
+int64_t Clock::Frame(const M_Ratio& seconds) const {
+  return M_FrameAt(seconds, rate_, M_Rounding::Nearest);
+}
+
+bool Clock::IsWhole(const M_Ratio& seconds) const {
+  return M_FrameAt(seconds, rate_) == M_FrameAt(seconds, rate_, M_Rounding::Ceiling);
+}
+
+std::string Clock::Timecode(const M_Ratio& seconds) const {
+  return ToTimecode(Frame(seconds), rate_, isDropped_);
+}
+
 }  // namespace comp

@@ -24,6 +24,23 @@ std::string ToTimecode(int64_t frame, const M_Ratio& rate, bool isDropped);
 /// for another text, a number that is too large in its place, and one that is dropped.
 std::optional<int64_t> ParseTimecode(std::string_view text, const M_Ratio& rate);
 
+/// A rate, and how its frames are written. Of times that are known.
+class Clock {
+ public:
+  /// With dropped frames where the rate may have them.
+  Clock(const M_Ratio& rate, bool mayDrop) : rate_(rate), isDropped_(mayDrop && MayDrop(rate)) {}
+
+  /// The nearest.
+  int64_t Frame(const M_Ratio& seconds) const;
+  /// Whether a frame begins just then.
+  bool IsWhole(const M_Ratio& seconds) const;
+  std::string Timecode(const M_Ratio& seconds) const;
+
+ private:
+  M_Ratio rate_;
+  bool isDropped_;
+};
+
 }  // namespace comp
 
 #endif  // COMP_TIMECODE_H

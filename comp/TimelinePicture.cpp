@@ -3,16 +3,19 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <iterator>
 
+#include "Language.h"
 #include "M_Ops.h"
+#include "Text.h"
 #include "Timecode.h"
 #include "Wording.h"
 
 namespace comp {
 namespace {
 
-constexpr double kWidth = 960, kLeft = 110, kRight = 20, kTop = 64, kLane = 34, kBar = 26;
-constexpr double kLetter = 6.2;  // The width of one, about.
+constexpr double kWidth = 960, kLeft = 110, kRight = 20, kTop = 80, kLane = 34, kBar = 26;
+constexpr double kColumn = 6.2;  // The width of a letter, about.
 
 double ToDouble(const Seconds& time) {
   return time.IsKnown() ? time.ratio.num / static_cast<double>(time.ratio.den) : 0;
@@ -20,11 +23,16 @@ double ToDouble(const Seconds& time) {
 
 // Follows the reader's choice of light or dark.
 constexpr char kStyle[] =
-    "<style>text{fill:#222}.quiet{fill:#666}.lane{fill:#8882}.rule{stroke:#8888}.clip{fill:#7fa8d6}"
-    ".stack{fill:#e3b466}.gap{fill:none;stroke:#8888;stroke-dasharray:3 3}.transition{fill:#b04f;"
-    "fill-opacity:.35;stroke:#b04f}.name{fill:#111}@media(prefers-color-scheme:dark){text{fill:#"
-    "eee}"
-    ".quiet{fill:#aaa}.name{fill:#111}}</style>\n";
+    "<style>:root{color-scheme:light dark}text{fill:#222}.quiet{fill:#666}.lane{fill:#8882}"
+    ".rule{stroke:#8888}.clip{fill:#7fa8d6}.stack{fill:#e3b466}.gap{fill:none;stroke:#8888;"
+    "stroke-dasharray:3 3}.transition{fill:#b04f;fill-opacity:.35;stroke:#b04f}.marker{fill:#d33}"
+    ".name{fill:#111}@media(prefers-color-scheme:dark){text{fill:#eee}.quiet{fill:#aaa}"
+    ".name{fill:#111}}</style>\n";
+
+constexpr const char* kClasses[] = {"clip", "gap", "transition", "stack"};
+// What the legend calls them.
+constexpr const char* kKinds[] = {Later("clip"), Later("gap"), Later("transition"),
+                                  Later("nested")};
 
 std::string Shape(const char* element, const std::string& attributes, const std::string& content) {
   return std::string("<")
@@ -41,23 +49,17 @@ std::string Text(double x, double y, const std::string& attributes, const std::s
                Escaped(text));
 }
 
-// The text or, with dots, as much of it as there is room for; nothing if that is too little.
-std::string Shortened(const std::string& text, double room) {
-  const auto letters = static_cast<size_t>(std::max(0.0, room / kLetter));
-  size_t count = 0, end = 0;
-  for (size_t i = 0; i < text.size(); ++i) {
-    if ((static_cast<unsigned char>(text[i]) & 0xC0) == 0x80) continue;
-    if (++count <= letters) end = i;
-  }
-  if (count <= letters) return text;
-  return letters < 3 ? "" : text.substr(0, end) + "…";
+// As much of a text as there is room for; nothing if that is too little.
+std::string Fitted(const std::string& text, double room) {
+  const auto columns = static_cast<size_t>(std::max(0.0, room / kColumn));
+  return columns < 3 && Columns(text) > columns ? "" : Shortened(text, columns);
 }
 
 class Drawing {
  public:
   Drawing(const Timeline& timeline, bool mayDrop)
       : timeline_(timeline),
-        isDropped_(mayDrop && MayDrop(timeline.rate)),
+        clock_(timeline.rate, mayDrop),
         length_(std::max(ToDouble(timeline.duration), 1e-3)) {}
 
   std::string Make() {
@@ -68,11 +70,12 @@ class Drawing {
                   "font-family=\"sans-serif\" font-size=\"11\">\n",
                   kWidth, height);
     std::string svg = head + Shape("title", "", Escaped(timeline_.name)) + kStyle;
-    svg += Text(kLeft, 18, "font-size=\"14\"", Shortened(timeline_.name, 500));
+    svg += Text(kLeft, 18, "font-size=\"14\"", Fitted(timeline_.name, 600));
     char length[64];
     std::snprintf(length, sizeof length, "%.3f s", ToDouble(timeline_.duration));
     svg += Text(kWidth - kRight, 18, "class=\"quiet\" text-anchor=\"end\"",
                 Timecode(timeline_.duration) + " = " + length);
+    svg += Legend();
     svg += Ruler(height);
     for (size_t i = 0; i < timeline_.tracks.size(); ++i) {
       svg += Lane(timeline_.tracks[i], i, kTop + kLane * static_cast<double>(i));
@@ -86,9 +89,31 @@ class Drawing {
     return std::clamp(x, kLeft, kWidth - kRight);
   }
   std::string Timecode(const Seconds& time) const {
-    if (!time.IsKnown()) return "?";
-    return ToTimecode(M_FrameAt(time.ratio, timeline_.rate, M_Rounding::Nearest), timeline_.rate,
-                      isDropped_);
+    return time.IsKnown() ? clock_.Timecode(time.ratio) : "?";
+  }
+
+  // The kinds that there are.
+  std::string Legend() const {
+    bool isThere[std::size(kKinds)] = {}, hasMarkers = false;
+    for (const Track& track : timeline_.tracks) {
+      for (const Item& item : track.items) isThere[static_cast<int>(item.kind)] = true;
+      hasMarkers |= !track.markers.empty();
+    }
+    std::string svg;
+    double x = kLeft;
+    const auto add = [&](const char* style, const char* name) {
+      svg += Shape("rect",
+                   "class=\"" + std::string(style) + "\" x=\"" + ToText(x) +
+                       "\" y=\"30\" width=\"12\" height=\"12\" rx=\"2\"",
+                   "");
+      svg += Text(x + 17, 40, "class=\"quiet\"", name);
+      x += 36 + kColumn * static_cast<double>(Columns(name));
+    };
+    for (size_t i = 0; i < std::size(kKinds); ++i) {
+      if (isThere[i]) add(kClasses[i], Tr(kKinds[i]));
+    }
+    if (hasMarkers) add("marker", Tr("marker"));
+    return svg;
   }
 
   // A mark at whole seconds, minutes or hours, as many as there is room for.
@@ -120,18 +145,25 @@ class Drawing {
                   kWidth - kLeft - kRight, kBar);
     const std::string label = track.kind + ' ' + std::to_string(number + 1);
     std::string svg = Shape("rect", rectangle, Shape("title", "", Escaped(track.name)));
-    svg += Text(8, y + 17, "", Shortened(track.name.empty() ? label : track.name, kLeft - 16));
+    svg += Text(8, y + 17, "", Fitted(track.name.empty() ? label : track.name, kLeft - 16));
     // Transitions lie on what they join.
     for (const bool areTransitions : {false, true}) {
       for (const Item& item : track.items) {
         if ((item.kind == Item::Kind::kTransition) == areTransitions) svg += Bar(item, y);
       }
     }
+    for (const Marker& marker : track.markers) {
+      const double x = X(marker.in);
+      svg += Shape("polygon",
+                   "class=\"marker\" points=\"" + ToText(x - 4) + "," + ToText(y - 4) + " " +
+                       ToText(x + 4) + "," + ToText(y - 4) + " " + ToText(x) + "," + ToText(y + 4) +
+                       "\"",
+                   Shape("title", "", Escaped(marker.name) + ", " + Timecode(marker.in)));
+    }
     return svg;
   }
 
   std::string Bar(const Item& item, double y) const {
-    static constexpr const char* kClasses[] = {"clip", "gap", "transition", "stack"};
     const double left = X(item.recordIn), right = X(item.recordOut), width = right - left;
     const std::string speed = item.speed == M_Ratio{1, 1} ? "" : " x " + SpeedText(item.speed);
     const std::string title = Shape("title", "",
@@ -152,7 +184,7 @@ class Drawing {
                                 ToText(kBar - 2) + "\" rx=\"2\"",
                             title);
     if (item.kind == Item::Kind::kGap) return svg;
-    const std::string name = Shortened(item.name + speed, width - 8);
+    const std::string name = Fitted(item.name + speed, width - 8);
     return name.empty() ? svg : svg + Text(left + 4, y + 17, "class=\"name\"", name);
   }
 
@@ -161,7 +193,7 @@ class Drawing {
   }
 
   const Timeline& timeline_;
-  bool isDropped_;
+  Clock clock_;
   double length_;
 };
 

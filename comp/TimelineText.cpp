@@ -2,9 +2,10 @@
 
 #include <cstdio>
 #include <nlohmann/json.hpp>
-#include <sstream>
 
+#include "Language.h"
 #include "M_Ops.h"
+#include "Text.h"
 #include "Timecode.h"
 #include "Wording.h"
 
@@ -13,31 +14,16 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-constexpr const char* kKinds[] = {"clip", "gap", "transition", "stack"};
+constexpr const char* kKinds[] = {Later("clip"), Later("gap"), Later("transition"), Later("stack")};
 
-// A timeline's rate, and how its frames are written.
-class Clock {
- public:
-  Clock(const M_Ratio& rate, bool mayDrop) : rate_(rate), isDropped_(mayDrop && MayDrop(rate)) {}
+const char* KindOf(const Item& item) { return kKinds[static_cast<int>(item.kind)]; }
 
-  int64_t Frame(const Seconds& time) const {
-    return M_FrameAt(time.ratio, rate_, M_Rounding::Nearest);
-  }
-  bool IsWhole(const Seconds& time) const {
-    return time.isExact &&
-           M_FrameAt(time.ratio, rate_) == M_FrameAt(time.ratio, rate_, M_Rounding::Ceiling);
-  }
-  std::string Timecode(const Seconds& time) const {
-    return ToTimecode(Frame(time), rate_, isDropped_);
-  }
-
- private:
-  M_Ratio rate_;
-  bool isDropped_;
-};
+bool IsWhole(const Clock& clock, const Seconds& time) {
+  return time.isExact && clock.IsWhole(time.ratio);
+}
 
 std::string Decimal(const Seconds& time) {
-  if (!time.IsKnown()) return "overflow";
+  if (!time.IsKnown()) return Tr("overflow");
   char text[40];
   std::snprintf(text, sizeof text, "%.3f", time.ratio.num / static_cast<double>(time.ratio.den));
   return std::string(time.isExact ? "" : "~").append(text);
@@ -45,28 +31,72 @@ std::string Decimal(const Seconds& time) {
 
 // A timecode; marked where the time is not exact, or lies within a frame.
 std::string Cell(const Clock& clock, const Seconds& time) {
-  if (!time.IsKnown()) return "overflow";
-  return std::string(clock.IsWhole(time) ? "" : "~").append(clock.Timecode(time));
+  if (!time.IsKnown()) return Tr("overflow");
+  return std::string(IsWhole(clock, time) ? "" : "~").append(clock.Timecode(time.ratio));
 }
 
-// As much of a text as there is room for, by characters of UTF-8.
-std::string Fitted(const std::string& given, size_t room) {
-  std::string text;
-  size_t length = 0;
-  for (const char c : given) {
-    const bool isFirst = (static_cast<unsigned char>(c) & 0xC0) != 0x80;
-    if (isFirst && ++length > room) return text;
-    text += c;
+std::string Cells(const std::string& kind, const std::string& name, const std::string& in,
+                  const std::string& out, const std::string& sourceIn, const std::string& sourceOut,
+                  const std::string& seconds) {
+  constexpr size_t kKind = 10, kName = 17, kTimecode = 14, kSeconds = 12;
+  return "  " + PadRight(Shortened(kind, kKind), kKind) + ' ' +
+         PadRight(Shortened(name, kName), kName) + PadLeft(in, kTimecode) +
+         PadLeft(out, kTimecode) + PadLeft(sourceIn, kTimecode) + PadLeft(sourceOut, kTimecode) +
+         PadLeft(seconds, kSeconds) + '\n';
+}
+
+std::string ItemText(const Clock& clock, const Item& item) {
+  std::string text = Cells(Tr(KindOf(item)), Printable(item.name), Cell(clock, item.recordIn),
+                           Cell(clock, item.recordOut), Cell(clock, item.sourceIn),
+                           Cell(clock, item.sourceOut), Decimal(item.recordOut - item.recordIn));
+  std::string more;
+  if (item.size) more = Tr("{0} x {1} pixels", {ToText(item.size->x), ToText(item.size->y)});
+  if (item.speed != M_Ratio{1, 1}) {
+    more.append(more.empty() ? "" : ", ").append(Tr("at a speed of {0}", {RateText(item.speed)}));
   }
-  return text.append(room - length, ' ');
+  if (!more.empty()) text.append(13, ' ').append(more).append("\n");
+  return text;
 }
 
-std::string Line(const std::string& label, const std::string& name, const std::string& in,
-                 const std::string& out, const std::string& sourceIn, const std::string& seconds) {
-  char cells[160];
-  std::snprintf(cells, sizeof cells, " %13s %13s %13s %12s", in.c_str(), out.c_str(),
-                sourceIn.c_str(), seconds.c_str());
-  return "  " + Fitted(label, 10) + ' ' + Fitted(name, 28) + cells + '\n';
+std::string TrackText(const Clock& clock, const Track& track, size_t number) {
+  std::string text(1, '\n');
+  text += Tr("Track {0}, {1}", {std::to_string(number), Printable(track.kind)});
+  if (!track.name.empty()) text.append(", \"").append(Printable(track.name)).append("\"");
+  text.append(", ").append(Decimal(track.duration)).append(" s\n");
+  if (!track.items.empty()) {
+    text += Cells("", "", Tr("record in"), Tr("record out"), Tr("source in"), Tr("source out"),
+                  Tr("seconds"));
+  }
+  for (const Item& item : track.items) text += ItemText(clock, item);
+  for (const Marker& marker : track.markers) {
+    text +=
+        Cells(Tr("marker"), Printable(marker.name), Cell(clock, marker.in), Cell(clock, marker.out),
+              "", Printable(marker.color), Decimal(marker.out - marker.in));
+  }
+  return text;
+}
+
+// Length, rates, and what is not exact.
+std::string Summary(const Clock& clock, const Timeline& timeline) {
+  std::string text = Tr("Timeline \"{0}\"", {Printable(timeline.name)}) + "\n  ";
+  text +=
+      Tr("{0} frames a second, {1} long, starts at {2}",
+         {RateText(timeline.rate), Cell(clock, timeline.duration), Cell(clock, timeline.start)});
+  text += '\n';
+  std::vector<std::string> rates;
+  for (const M_Ratio& rate : timeline.rates) rates.push_back(RateText(rate));
+  text += Line(Tr("duration"), {Decimal(timeline.duration), "s"});
+  text += Line(Tr("counted in"), Listed(std::move(rates)));
+  Doubts doubts;
+  for (const Track& track : timeline.tracks) {
+    for (const Item& item : track.items) {
+      for (const Seconds* time :
+           {&item.recordIn, &item.recordOut, &item.sourceIn, &item.sourceOut}) {
+        doubts.Add(time->IsKnown(), time->isExact, time->maxError);
+      }
+    }
+  }
+  return text.append("  ").append(doubts.Text()).append("\n");
 }
 
 Json ToJson(const Clock& clock, const Seconds& time) {
@@ -77,11 +107,13 @@ Json ToJson(const Clock& clock, const Seconds& time) {
             {"wholeFrame", false},
             {"timecode", nullptr}};
   }
-  return {{"seconds", RatioText(time.ratio)},
-          {"exact", time.isExact},
-          {"frame", clock.Frame(time)},
-          {"wholeFrame", clock.IsWhole(time)},
-          {"timecode", clock.Timecode(time)}};
+  Json json = {{"seconds", RatioText(time.ratio)},
+               {"exact", time.isExact},
+               {"frame", clock.Frame(time.ratio)},
+               {"wholeFrame", IsWhole(clock, time)},
+               {"timecode", clock.Timecode(time.ratio)}};
+  if (!time.isExact) json["maxError"] = time.maxError;
+  return json;
 }
 
 }  // namespace
@@ -90,29 +122,17 @@ std::string ToTable(const std::vector<Timeline>& timelines, bool mayDrop) {
   std::string text;
   for (const Timeline& timeline : timelines) {
     const Clock clock(timeline.rate, mayDrop);
-    if (!text.empty()) text += '\n';
-    text += "Timeline \"" + Printable(timeline.name) + "\"\n  " + RateText(timeline.rate) +
-            " frames a second, " + Cell(clock, timeline.duration) + " long (" +
-            Decimal(timeline.duration) + " s), starts at " + Cell(clock, timeline.start) + '\n';
+    text.append(text.empty() ? "" : "\n").append(Summary(clock, timeline));
     for (size_t i = 0; i < timeline.tracks.size(); ++i) {
-      const Track& track = timeline.tracks[i];
-      text += "\nTrack " + std::to_string(i + 1) + ", " + track.kind;
-      if (!track.name.empty()) text += ", \"" + Printable(track.name) + '"';
-      text += ", " + Decimal(track.duration) + " s\n";
-      text += Line("", "", "record in", "record out", "source in", "duration/s");
-      for (const Item& item : track.items) {
-        std::string label = kKinds[static_cast<int>(item.kind)];
-        text += Line(label, Printable(item.name), Cell(clock, item.recordIn),
-                     Cell(clock, item.recordOut), Cell(clock, item.sourceIn),
-                     Decimal(item.recordOut - item.recordIn));
-        if (item.speed != M_Ratio{1, 1})
-          text += "             at a speed of " + RateText(item.speed) + '\n';
-      }
+      text += TrackText(clock, timeline.tracks[i], i + 1);
     }
-    for (const std::string& remark : timeline.remarks) text += "\nRemark: " + remark + '.';
+    for (const std::string& remark : timeline.remarks) {
+      text += '\n';
+      text += Tr("Remark: {0}.", {Printable(remark)});
+    }
     if (!timeline.remarks.empty()) text += '\n';
   }
-  return text + "\n~ marks a time that is not exact, or lies within a frame.\n";
+  return text + "\n" + Tr("~ marks a time that is not exact, or lies within a frame.") + "\n";
 }
 
 std::string ToCsv(const std::vector<Timeline>& timelines, bool mayDrop) {
@@ -128,8 +148,8 @@ std::string ToCsv(const std::vector<Timeline>& timelines, bool mayDrop) {
     const Clock clock(timeline.rate, mayDrop);
     for (size_t i = 0; i < timeline.tracks.size(); ++i) {
       for (const Item& item : timeline.tracks[i].items) {
-        text += quoted(timeline.name) + ',' + std::to_string(i + 1) + ',' +
-                kKinds[static_cast<int>(item.kind)] + ',' + quoted(item.name);
+        text += quoted(timeline.name) + ',' + std::to_string(i + 1) + ',' + KindOf(item) + ',' +
+                quoted(item.name);
         bool isExact = true;
         for (const Seconds& time : {item.recordIn, item.recordOut, item.sourceIn, item.sourceOut}) {
           text.append(",").append(time.IsKnown() ? RatioText(time.ratio) : "");
@@ -137,7 +157,7 @@ std::string ToCsv(const std::vector<Timeline>& timelines, bool mayDrop) {
         }
         text.append(",").append(RatioText(item.speed)).append(isExact ? ",1" : ",0");
         for (const Seconds& time : {item.recordIn, item.recordOut}) {
-          text.append(",").append(time.IsKnown() ? clock.Timecode(time) : "");
+          text.append(",").append(time.IsKnown() ? clock.Timecode(time.ratio) : "");
         }
         text += '\n';
       }
@@ -154,18 +174,28 @@ std::string ToJson(const std::vector<Timeline>& timelines, bool mayDrop) {
     for (const Track& track : timeline.tracks) {
       Json items = Json::array();
       for (const Item& item : track.items) {
-        items.push_back({{"kind", kKinds[static_cast<int>(item.kind)]},
-                         {"name", item.name},
-                         {"recordIn", ToJson(clock, item.recordIn)},
-                         {"recordOut", ToJson(clock, item.recordOut)},
-                         {"sourceIn", ToJson(clock, item.sourceIn)},
-                         {"sourceOut", ToJson(clock, item.sourceOut)},
-                         {"speed", RatioText(item.speed)}});
+        Json json = {{"kind", KindOf(item)},
+                     {"name", item.name},
+                     {"recordIn", ToJson(clock, item.recordIn)},
+                     {"recordOut", ToJson(clock, item.recordOut)},
+                     {"sourceIn", ToJson(clock, item.sourceIn)},
+                     {"sourceOut", ToJson(clock, item.sourceOut)},
+                     {"speed", RatioText(item.speed)}};
+        if (item.size) json["size"] = {item.size->x, item.size->y};
+        items.push_back(std::move(json));
+      }
+      Json markers = Json::array();
+      for (const Marker& marker : track.markers) {
+        markers.push_back({{"name", marker.name},
+                           {"color", marker.color},
+                           {"in", ToJson(clock, marker.in)},
+                           {"out", ToJson(clock, marker.out)}});
       }
       tracks.push_back({{"name", track.name},
                         {"kind", track.kind},
                         {"duration", ToJson(clock, track.duration)},
-                        {"items", std::move(items)}});
+                        {"items", std::move(items)},
+                        {"markers", std::move(markers)}});
     }
     all.push_back({{"name", timeline.name},
                    {"rate", RatioText(timeline.rate)},

@@ -5,8 +5,10 @@
 #include <cstdio>
 #include <sstream>
 
+#include "Language.h"
 #include "M_Ops.h"
 #include "Rates.h"
+#include "Text.h"
 
 namespace comp {
 
@@ -52,37 +54,57 @@ std::string RateText(const M_Ratio& rate) {
   return text.str();
 }
 
-std::string Printable(std::string name) {
-  for (char& c : name) {
-    if (static_cast<unsigned char>(c) < 0x20 || c == 0x7F) c = '?';
+std::string SecondsText(const M_Ratio& seconds, double maxError) {
+  char text[80];
+  const double value = seconds.num / static_cast<double>(seconds.den);
+  if (maxError == 0) {
+    std::snprintf(text, sizeof text, "%.6f", value);
+  } else {
+    std::snprintf(text, sizeof text, "~%.*f ±%.1g", maxError < 1e-3 ? 6 : 3, value, maxError);
   }
-  return name;
+  return text;
 }
 
-std::string Escaped(const std::string& name) {
-  std::string escaped;
-  for (const char c : Printable(name)) {
-    switch (c) {
-      case '&':
-        escaped += "&amp;";
-        break;
-      case '<':
-        escaped += "&lt;";
-        break;
-      case '>':
-        escaped += "&gt;";
-        break;
-      default:
-        escaped += c;
+void Doubts::Add(bool isKnown, bool isExact, double maxError) {
+  ++all_;
+  unknown_ += isKnown ? 0 : 1;
+  approximated_ += isKnown && !isExact ? 1 : 0;
+  maxError_ = std::max(maxError_, maxError);
+}
+
+std::string Doubts::Text() const {
+  if (approximated_ + unknown_ == 0) return Tr("All times are exact.");
+  char most[32];
+  std::snprintf(most, sizeof most, "%.1g", maxError_);
+  const std::string all = std::to_string(all_);
+  std::string text;
+  if (approximated_ > 0) {
+    text = Tr("Not exact: {0} of {1} times, which are off by {2} s at most.",
+              {std::to_string(approximated_), all, most});
+  }
+  if (unknown_ == 0) return text;
+  return text.append(text.empty() ? "" : " ")
+      .append(Tr("Beyond 32 bits: {0} of {1} times.", {std::to_string(unknown_), all}));
+}
+
+std::vector<std::string> Listed(std::vector<std::string> words) {
+  for (std::string& word : words) {
+    if (&word != &words.back()) word += ',';
+  }
+  return words;
+}
+
+std::string Line(const std::string& label, const std::vector<std::string>& words) {
+  constexpr size_t kMargin = 16, kWidth = 100;
+  std::string text, line = PadRight("  " + label, kMargin - 1);
+  for (const std::string& word : words) {
+    if (Columns(line) + 1 + Columns(word) > kWidth) {
+      text.append(line).append("\n");
+      line.assign(kMargin - 1, ' ');
     }
+    line.append(" ").append(word);
   }
-  return escaped;
-}
-
-std::string Line(const std::string& label, const std::string& text) {
-  std::string line = std::string("  ").append(label);
-  line.resize(std::max<size_t>(line.size() + 1, 14), ' ');
-  return line.append(text).append("\n");
+  return text.append(line).append("\n");
 }
 
 }  // namespace comp

@@ -5,6 +5,7 @@
 
 #include <initializer_list>
 #include <string>
+#include <vector>
 
 #include "Composition.h"
 
@@ -26,14 +27,26 @@ std::string RatioText(const M_Ratio& ratio);
 /// A rate, "25" or "29.97 (30000/1001)".
 std::string RateText(const M_Ratio& rate);
 
-/// A name from a file with nothing in it that moves a cursor, or that XML does not allow.
-std::string Printable(std::string name);
+/// A time in seconds with six decimals; where it is not exact, by how much it may be off.
+std::string SecondsText(const M_Ratio& seconds, double maxError);
 
-/// The same with what has a meaning in XML written out.
-std::string Escaped(const std::string& name);
+/// How many times are approximated, by how much at most, and how many do not fit.
+class Doubts {
+ public:
+  void Add(bool isKnown, bool isExact, double maxError);
+  /// A sentence about it.
+  std::string Text() const;
 
-/// An indented line with a label.
-std::string Line(const std::string& label, const std::string& text);
+ private:
+  size_t all_ = 0, approximated_ = 0, unknown_ = 0;
+  double maxError_ = 0;
+};
+
+/// The words with commas behind all but the last.
+std::vector<std::string> Listed(std::vector<std::string> words);
+
+/// Indented lines of at most 100 columns with a label.
+std::string Line(const std::string& label, const std::vector<std::string>& words);
 
 }  // namespace comp
 

@@ -16,10 +16,13 @@
 #include <vector>
 
 #include "Composition.h"
+#include "Language.h"
 #include "M_Utils.h"
 #include "Otio.h"
 #include "Picture.h"
 #include "SheetText.h"
+#include "Terminal.h"
+#include "Text.h"
 #include "TimelinePicture.h"
 #include "TimelineText.h"
 #include "U.h"
@@ -27,24 +30,28 @@
 
 namespace {
 
+using comp::Later;
+using comp::Tr;
+
 constexpr int kBadInput = 2;
 
-constexpr char kAbout[] =
-    R"(Prints the sheet of each file. Of a composition: its frame rate, start and
-duration, and for every layer its in and out points as exact ratios in seconds
-and as frames, also clipped to the composition, its stretch and the running sum
-of the durations; with a size also where its layers lie: what kind of matrix
-places each of them, its corners, the pixels it touches and those in the frame; and for layers in space how they are moved,
-scaled, sheared and turned, and where the camera sees them. Of a timeline of
-OpenTimelineIO (.otio): what is where in each track, record and source times as
-timecode, and how long everything is, exactly. A FILE of - is the standard input.
+constexpr const char* kAbout = Later(
+    R"(Prints the sheet of each FILE; - is the standard input.
 
-With --svg the file is drawn instead: a timeline's tracks as lanes; or, of a
-composition with a size, the frame, the outline of every layer, filled from back
-to front, with a dashed line around its part in the frame, layers seen from the
-side as a line, and the hull of them all.)";
+Of a composition: when each layer is there, in exact seconds, frames and
+timecode, also held to the composition. With a size also where its layers lie:
+their corners and pixels, and for layers in space how they are moved, scaled,
+sheared and turned, and where the camera sees them.
 
-constexpr char kFormat[] = R"(A composition file is a JSON object:
+Of a timeline of OpenTimelineIO (.otio): what is where in each track, record and
+source times as timecode, and how long everything is.
+
+With --svg the file is drawn instead: a timeline's tracks as lanes; a
+composition as a viewer shows it, its layers filled from back to front, those
+seen from the side as lines, with a dashed line around what is in the frame, and
+the hull of them all.)");
+
+constexpr const char* kFormat = Later(R"(A composition file is a JSON object:
   name       text
   frameRate  frames a second: "24000/1001", 25, or a decimal: 23.976, 29.97
              and their like stand for thousands over 1001
@@ -74,9 +81,13 @@ constexpr char kFormat[] = R"(A composition file is a JSON object:
     keys        list of orientations with a "frame" each, between which it turns
 
 Exit status: 0 if every sheet was printed, 1 if the output cannot be written, 2
-if an argument or a file cannot be used. The library's own reports are part of
-the sheet, in the language of the environment.
-)";
+if an argument or a file cannot be used. What the library reports is part of the
+sheet. A terminal gets colours, unless NO_COLOR is set.
+)");
+
+void Say(const std::string& sentence) {
+  std::cerr << "comp: " << comp::Printable(sentence) << '\n';
+}
 
 // A whole file; "-" is the standard input.
 std::string ReadText(const std::string& fileName) {
@@ -84,7 +95,8 @@ std::string ReadText(const std::string& fileName) {
   std::ifstream file;
   if (fileName != "-") file.open(fileName);
   std::istream& in = fileName == "-" ? std::cin : file;
-  if (!(text << in.rdbuf()) && !in.eof()) throw comp::InputError(fileName + ": cannot be read.");
+  if (!(text << in.rdbuf()) && !in.eof())
+    throw comp::InputError(Tr("{0}: cannot be read.", {fileName}));
   return text.str();
 }
 
@@ -100,11 +112,14 @@ struct Arguments {
 
 // The sheets of all files, complete before anything is printed. As JSON one document: all timelines
 // together, and an array where there is more than that.
-std::string MakeSheets(const Arguments& arguments) {
+std::string MakeSheets(const Arguments& arguments, comp::Progress* progress) {
   std::vector<std::string> documents;
   std::vector<comp::Timeline> timelines;
   const bool areTogether = arguments.asJson || arguments.asCsv;
+  size_t number = 0;
   for (const std::string& fileName : arguments.fileNames) {
+    progress->Say(Tr("{0} ({1} of {2})", {comp::Printable(fileName), std::to_string(++number),
+                                          std::to_string(arguments.fileNames.size())}));
     const std::string file = ReadText(fileName);
     if (comp::IsOtio(file)) {
       const auto read = comp::ReadOtio(file, fileName);
@@ -112,11 +127,12 @@ std::string MakeSheets(const Arguments& arguments) {
       if (!areTogether) documents.push_back(comp::ToTable(read, arguments.mayDrop));
       continue;
     }
-    if (arguments.asCsv) throw comp::InputError(fileName + ": --csv is for timelines.");
+    if (arguments.asCsv) throw comp::InputError(Tr("{0}: --csv is for timelines.", {fileName}));
     std::istringstream stream(file);
     const comp::Sheet sheet =
         comp::MakeSheet(comp::ReadComposition(stream, fileName), arguments.withOverlaps);
-    documents.push_back(arguments.asJson ? comp::ToJson(sheet) : comp::ToTable(sheet));
+    documents.push_back(arguments.asJson ? comp::ToJson(sheet)
+                                         : comp::ToTable(sheet, arguments.mayDrop));
   }
   if (arguments.asJson && !timelines.empty()) {
     documents.push_back(comp::ToJson(timelines, arguments.mayDrop));
@@ -138,20 +154,21 @@ void AddOptions(CLI::App* app, Arguments* arguments) {
         double number;
         const auto [rest, error] = std::from_chars(text.data(), text.data() + text.size(), number);
         const bool isFinite = error == std::errc() && *rest == '\0' && std::isfinite(number);
-        return isFinite ? std::string() : text + " is not a number";
+        return isFinite ? std::string() : Tr("{0} is not a number", {text});
       },
       "");
   comp::PictureOptions& picture = arguments->picture;
   app->set_version_flag("--version", COMP_VERSION);
-  app->add_option("FILE", arguments->fileNames, "compositions and timelines")->required();
-  auto* const json = app->add_flag("--json", arguments->asJson, "prints sheets as JSON");
-  app->add_flag("--csv", arguments->asCsv, "prints timelines as comma-separated values")
+  app->add_option("FILE", arguments->fileNames, Tr("compositions and timelines"))->required();
+  auto* const json = app->add_flag("--json", arguments->asJson, Tr("prints sheets as JSON"));
+  app->add_flag("--csv", arguments->asCsv, Tr("prints timelines as comma-separated values"))
       ->excludes(json);
-  app->add_flag("--overlaps", arguments->withOverlaps, "also what layers have in common");
-  app->add_flag("--drop-frame", arguments->mayDrop, "timecode of 29.97 and 59.94 drops frames");
-  auto* const svg = app->add_option("--svg", arguments->svg, "the file to draw to")->excludes(json);
+  app->add_flag("--overlaps", arguments->withOverlaps, Tr("also what layers have in common"));
+  app->add_flag("--drop-frame", arguments->mayDrop, Tr("timecode of 29.97 and 59.94 drops frames"));
+  auto* const svg =
+      app->add_option("--svg", arguments->svg, Tr("the file to draw to"))->excludes(json);
   app->add_option("--time", picture.frame,
-                  "as it is at a frame; else with every layer, at its first key")
+                  Tr("as it is at a frame; else with every layer, at its first key"))
       ->needs(svg)
       ->check(finite);
   app->add_option_function<std::array<double, 2>>(
@@ -159,20 +176,20 @@ void AddOptions(CLI::App* app, Arguments* arguments) {
          [&](const auto& point) {
            picture.point = {point[0], point[1]};
          },
-         "marks a point X,Y, and prints the layers under it from front to back with the distance "
-         "of "
-         "their nearest edge")
+         Tr("marks a point X,Y, and prints the layers under it from front to back with the "
+            "distance of their nearest edge"))
       ->delimiter(',')
       ->needs(svg)
       ->check(finite);
-  app->add_option("--tolerance", picture.tolerance, "pixels by which a hit may be beside a layer")
+  app->add_option("--tolerance", picture.tolerance,
+                  Tr("pixels by which a hit may be beside a layer"))
       ->needs(svg)
       ->check(finite);
   app->add_option("--grid", picture.grid,
-                  "draws N x N points in the colours of the layers they hit")
+                  Tr("draws N x N points in the colours of the layers they hit"))
       ->needs(svg)
       ->check(CLI::Range(1, 1000));
-  app->footer(kFormat);
+  app->footer(Tr(kFormat));
 }
 
 void WriteFile(const std::string& name, const std::string& text) {
@@ -181,8 +198,9 @@ void WriteFile(const std::string& name, const std::string& text) {
 }
 
 // Draws to a file; returns what is to be printed.
-std::string MakePicture(const Arguments& arguments) {
+std::string MakePicture(const Arguments& arguments, comp::Progress* progress) {
   const std::string& fileName = arguments.fileNames[0];
+  progress->Say(comp::Printable(fileName));
   const std::string given = ReadText(fileName);
   if (comp::IsOtio(given)) {
     WriteFile(arguments.svg, comp::Draw(comp::ReadOtio(given, fileName)[0], arguments.mayDrop));
@@ -191,38 +209,37 @@ std::string MakePicture(const Arguments& arguments) {
   std::istringstream stream(given);
   const comp::Composition composition = comp::ReadComposition(stream, fileName);
   if (!composition.size) {
-    throw comp::InputError(fileName + ": composition has no \"size\" to be drawn in.");
+    throw comp::InputError(Tr("{0}: composition has no \"size\" to be drawn in.", {fileName}));
   }
   const comp::Picture picture = comp::Draw(composition, arguments.picture);
   WriteFile(arguments.svg, picture.svg);
   for (const comp::Report& report : picture.reports) {
-    std::cerr << "comp: layer \"" << report.layer << "\": " << report.text << '\n';
+    std::cerr << "comp: " << Tr("layer \"{0}\": {1}", {comp::Printable(report.layer), report.text})
+              << '\n';
   }
   std::string text;
   for (const comp::Hit& hit : picture.hits) {
-    text +=
-        comp::Printable(hit.name) + ", " + comp::ToText(hit.distance) + " from its nearest edge\n";
+    text += Tr("{0}, {1} from its nearest edge",
+               {comp::Printable(hit.name), comp::ToText(hit.distance)}) +
+            '\n';
   }
-  if (arguments.picture.point && text.empty()) text = "nothing\n";
+  if (arguments.picture.point && text.empty()) text = std::string(Tr("nothing")) + "\n";
   return text;
 }
 
 int Run(int argc, char** argv) {
-  std::setlocale(LC_ALL, "");
-  // What machines read has points in its decimals, wherever it is made.
-  std::setlocale(LC_NUMERIC, "C");
   Arguments arguments;
-  CLI::App app(kAbout, "comp");
+  CLI::App app(Tr(kAbout), "comp");
   AddOptions(&app, &arguments);
   try {
     app.parse(argc, argv);
     if (!arguments.svg.empty() && arguments.fileNames.size() != 1) {
-      throw CLI::ValidationError("--svg draws one file");
+      throw CLI::ValidationError(Tr("--svg draws one file"));
     }
   } catch (const CLI::Success& asked) {
     return app.exit(asked);
   } catch (const CLI::ParseError& error) {
-    std::cerr << "comp: " << error.what() << "; see comp --help.\n";
+    Say(Tr("{0}; see comp --help.", {error.what()}));
     return kBadInput;
   }
   // Birth and death are logged; a command line tool has no use for that.
@@ -230,16 +247,23 @@ int Run(int argc, char** argv) {
   if (M_Birth(0, nullptr) != 0) return EXIT_FAILURE;
   int status = 0;
   try {
-    const std::string text = arguments.svg.empty() ? MakeSheets(arguments) : MakePicture(arguments);
+    std::string text;
+    {
+      comp::Progress progress;
+      text = arguments.svg.empty() ? MakeSheets(arguments, &progress)
+                                   : MakePicture(arguments, &progress);
+    }
+    const bool isForPeople = arguments.svg.empty() && !arguments.asJson && !arguments.asCsv;
+    if (isForPeople && comp::TakesColor()) text = comp::Colored(text);
     if (!(std::cout << text << std::flush)) {
-      std::cerr << "comp: the output cannot be written.\n";
+      Say(Tr("The output cannot be written."));
       status = EXIT_FAILURE;
     }
   } catch (const comp::InputError& error) {
-    std::cerr << "comp: " << error.what() << '\n';
+    Say(error.what());
     status = kBadInput;
   } catch (const std::ios_base::failure&) {
-    std::cerr << "comp: the picture cannot be written.\n";
+    Say(Tr("The picture cannot be written."));
     status = EXIT_FAILURE;
   }
   M_Death();
@@ -249,12 +273,19 @@ int Run(int argc, char** argv) {
 }  // namespace
 
 int main(int argc, char** argv) {
+  std::setlocale(LC_ALL, "");
+  // What machines read has points in its decimals, wherever it is made.
+  std::setlocale(LC_NUMERIC, "C");
+  // At once, since a tree of JSON needs memory even to be given up.
+  static const char* const outOfMemory = Tr("There is not enough memory.");
+  std::set_new_handler([] {
+    std::fprintf(stderr, "comp: %s\n", outOfMemory);
+    std::_Exit(EXIT_FAILURE);
+  });
   try {
     return Run(argc, argv);
-  } catch (const std::bad_alloc&) {
-    std::fputs("comp: there is not enough memory.\n", stderr);
   } catch (const std::exception& error) {
-    std::fprintf(stderr, "comp: %s.\n", error.what());
+    Say(error.what());
   }
   return EXIT_FAILURE;
 }

@@ -31,7 +31,7 @@ def timecode(frame, rate):
 
 def check(shown, expected, rate):
     if not shown["exact"]:  # A sum that has outgrown 32 bits: the nearest ratio, and said to be.
-        assert abs(Fraction(shown["seconds"]) - expected) < Fraction(1, 100), shown
+        assert abs(Fraction(shown["seconds"]) - expected) <= Fraction(shown["maxError"]) < Fraction(1, 100), shown
         return 0
     frame = math.floor(expected * rate + Fraction(1, 2))
     assert Fraction(shown["seconds"]) == expected and shown["frame"] == frame, (shown, expected)

@@ -8,6 +8,7 @@
 #include "M_Ops.h"
 #include "Otio.h"
 #include "Rates.h"
+#include "Text.h"
 #include "Timecode.h"
 
 namespace {
@@ -118,17 +119,38 @@ TEST(Otio, TracksAreSummedExactly) {
 TEST(Otio, TrimmedTracksHoldWhatIsInTheTrim) {
   const std::string clip =
       R"({"OTIO_SCHEMA": "Clip.1", "source_range": )" + Range("5", "10", "24") +
-      R"(, "effects": [{"OTIO_SCHEMA": "LinearTimeWarp.1", "time_scalar": 2}]})";
+      R"(, "effects": [{"OTIO_SCHEMA": "LinearTimeWarp.1", "time_scalar": 2}],
+          "markers": [{"name": "m", "marked_range": )" +
+      Range("8", "0", "24") + R"(}], "media_reference": {"available_image_bounds":
+          {"min": {"x": -8, "y": -4.5}, "max": {"x": 8, "y": 4.5}}}})";
   const std::string text = R"({"OTIO_SCHEMA": "Track.1", "source_range": )" +
                            Range("12", "20", "24") + R"(, "children": [)" + clip + ',' + clip +
                            ',' + clip + ',' + clip + ',' + clip + "]}";
-  const auto items = comp::ReadOtio(text, "file").at(0).tracks.at(0).items;
+  const comp::Track track = comp::ReadOtio(text, "file").at(0).tracks.at(0);
+  const auto& items = track.items;
   ASSERT_EQ(items.size(), 3u);
   EXPECT_TRUE(items[0].recordIn.ratio == (M_Ratio{0, 1}) &&
               items[0].sourceIn.ratio == (M_Ratio{9, 24}));
   EXPECT_EQ(items[1].recordIn.ratio, (M_Ratio{8, 24}));
   EXPECT_TRUE(items[2].recordOut.ratio == (M_Ratio{20, 24}) &&
               items[2].sourceOut.ratio == (M_Ratio{9, 24}));
+  EXPECT_TRUE(items[0].size && items[0].size->x == 16 && items[0].size->y == 9);
+  ASSERT_EQ(track.markers.size(), 2u);
+  EXPECT_EQ(track.markers[0].in.ratio, (M_Ratio{1, 24}));
+}
+
+TEST(Text, FitsAndHoldsNothingOdd) {
+  const std::string text = "a\u0308\u3042\u3044b";
+  EXPECT_EQ(comp::Columns(text), 6u);
+  EXPECT_EQ(comp::Shortened(text, 6), text);
+  EXPECT_EQ(comp::Shortened(text, 5), "a\u0308\u3042…");
+  EXPECT_EQ(comp::Shortened(text, 1), "…");
+  EXPECT_EQ(comp::PadLeft("\u3042", 4), "  \u3042");
+  // Cut, overlong, a surrogate, beyond Unicode; and what is as it should be.
+  EXPECT_EQ(comp::Printable("\xE3\x81 \xC0\xAF \xED\xA0\x80 \xF4\x90\x80\x80")
+                .find_first_of("\xC0\xED\xF4"),
+            std::string::npos);
+  EXPECT_EQ(comp::Printable("\U0010FFFD\uD7FF\u07FF\x7F\uFFFF"), "\U0010FFFD\uD7FF\u07FF??");
 }
 
 }  // namespace
