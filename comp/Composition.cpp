@@ -82,8 +82,8 @@ class Fields {
     const std::string text = value;
     const size_t slash = text.find('/');
     if (slash == std::string::npos) return FromNumber(field, text, isFrameRate);
-    const auto num = Parse<int32_t>(text.substr(0, slash));
-    const auto den = Parse<int32_t>(text.substr(slash + 1));
+    const auto num = ToInteger(text.substr(0, slash));
+    const auto den = ToInteger(text.substr(slash + 1));
     if (!num || !den) ComplainAbout(field, "\"" + text + "\" is not a ratio of 32-bit numbers");
     if (*den == 0) ComplainAbout(field, "\"" + text + "\" has a zero denominator");
     if (*num <= 0 || *den < 0) ComplainAbout(field, "\"" + text + "\" is not greater than zero");
@@ -145,9 +145,8 @@ class Fields {
     return value;
   }
 
-  template <class T>
-  static std::optional<T> Parse(const std::string& text) {
-    T value;
+  static std::optional<int32_t> ToInteger(const std::string& text) {
+    int32_t value;
     const char* const end = text.data() + text.size();
     const auto [rest, error] = std::from_chars(text.data(), end, value);
     if (error != std::errc() || rest != end) return {};
@@ -155,7 +154,7 @@ class Fields {
   }
 
   GivenRatio FromNumber(const char* field, const std::string& text, bool isFrameRate) const {
-    const auto value = Parse<double>(text);
+    const auto value = ToDouble(text);
     if (!value || !std::isfinite(*value)) ComplainAbout(field, "\"" + text + "\" is not a number");
     if (*value <= 0) ComplainAbout(field, text + " is not greater than zero");
     const auto decimal = ToRatio(text, isFrameRate);
