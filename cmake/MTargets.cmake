@@ -14,6 +14,11 @@ function(m_add_library name)
     POSITION_INDEPENDENT_CODE ON
     VERSION ${PROJECT_VERSION}
     SOVERSION ${PROJECT_VERSION_MAJOR})
+  if(EMSCRIPTEN)
+    # Without it nothing that is thrown is caught. All parts of a program have to agree.
+    target_compile_options(${name} PUBLIC -fwasm-exceptions)
+    target_link_options(${name} PUBLIC -fwasm-exceptions)
+  endif()
   if(APPLE)
     # libM would be the system's libm on a disk that does not tell case.
     set_target_properties(${name} PROPERTIES PREFIX "" INSTALL_RPATH "@loader_path")

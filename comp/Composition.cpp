@@ -84,8 +84,8 @@ class Fields {
     const std::string text = value;
     const size_t slash = text.find('/');
     if (slash == std::string::npos) return FromNumber(field, text, isFrameRate);
-    const auto num = Parse<int32_t>(text.substr(0, slash));
-    const auto den = Parse<int32_t>(text.substr(slash + 1));
+    const auto num = ToInteger(text.substr(0, slash));
+    const auto den = ToInteger(text.substr(slash + 1));
     if (!num || !den) ComplainAbout(field, Tr("\"{0}\" is not a ratio of 32-bit numbers", {text}));
     if (*den == 0) ComplainAbout(field, Tr("\"{0}\" has a zero denominator", {text}));
     if (*num <= 0 || *den < 0) ComplainAbout(field, Tr("\"{0}\" is not greater than zero", {text}));
@@ -148,9 +148,8 @@ class Fields {
     return value;
   }
 
-  template <class T>
-  static std::optional<T> Parse(const std::string& text) {
-    T value;
+  static std::optional<int32_t> ToInteger(const std::string& text) {
+    int32_t value;
     const char* const end = text.data() + text.size();
     const auto [rest, error] = std::from_chars(text.data(), end, value);
     if (error != std::errc() || rest != end) return {};
@@ -158,7 +157,7 @@ class Fields {
   }
 
   GivenRatio FromNumber(const char* field, const std::string& text, bool isFrameRate) const {
-    const auto value = Parse<double>(text);
+    const auto value = ToDouble(text);
     if (!value || !std::isfinite(*value))
       ComplainAbout(field, Tr("\"{0}\" is not a number", {text}));
     if (*value <= 0) ComplainAbout(field, Tr("{0} is not greater than zero", {text}));

@@ -42,7 +42,8 @@ void FindOverlaps(std::vector<PlacedLayer>* layers) {
   std::vector<size_t> order(layers->size()), open;
   std::iota(order.begin(), order.end(), 0);
   const auto bounds = [&](size_t i) -> const M_LRect& { return (*layers)[i].bounds; };
-  std::ranges::stable_sort(order, {}, [&](size_t i) { return bounds(i).left; });
+  std::stable_sort(order.begin(), order.end(),
+                   [&](size_t i, size_t j) { return bounds(i).left < bounds(j).left; });
   std::vector<std::vector<size_t>> below(layers->size());
   for (const size_t i : order) {
     std::erase_if(open, [&](size_t other) { return bounds(other).right <= bounds(i).left; });
@@ -54,7 +55,7 @@ void FindOverlaps(std::vector<PlacedLayer>* layers) {
     open.push_back(i);
   }
   for (size_t i = 0; i < layers->size(); ++i) {
-    std::ranges::sort(below[i]);
+    std::sort(below[i].begin(), below[i].end());
     for (const size_t other : below[i]) {
       M_LRect common;
       M_SectLRect(&bounds(i), &bounds(other), &common);

@@ -1,7 +1,10 @@
 #include "Rates.h"
 
+#include <algorithm>
+#include <cerrno>
 #include <charconv>
 #include <cmath>
+#include <cstdlib>
 #include <string>
 #include <utility>
 
@@ -72,11 +75,31 @@ std::optional<M_Ratio> ToSmallRatio(double value) {
 
 }  // namespace
 
-std::optional<Decimal> ToRatio(std::string_view decimal, bool isRate) {
+std::optional<double> ToDouble(std::string_view decimal) {
+#ifdef __cpp_lib_to_chars
   double value;
   const char* const end = decimal.data() + decimal.size();
   const auto [rest, error] = std::from_chars(decimal.data(), end, value);
-  if (error != std::errc() || rest != end || !std::isfinite(value)) return {};
+  if (error != std::errc() || rest != end) return {};
+  return value;
+#else
+  // A standard library that has no such function for doubles yet.
+  if (decimal.starts_with('+') || decimal.find_first_not_of("0123456789+-.eE") != decimal.npos)
+    return {};
+  const std::string text(decimal);
+  char* rest;
+  errno = 0;
+  const double value = std::strtod(text.c_str(), &rest);
+  const bool isOutOfRange = errno == ERANGE && (value == 0 || std::isinf(value));
+  if (rest == text.c_str() || *rest != 0 || isOutOfRange) return {};
+  return value;
+#endif
+}
+
+std::optional<Decimal> ToRatio(std::string_view decimal, bool isRate) {
+  const auto read = ToDouble(decimal);
+  if (!read || !std::isfinite(*read)) return {};
+  const double value = *read;
   if (isRate) {
     if (const auto rate = ToBroadcastRate(decimal, value)) return Decimal{*rate, true};
   }

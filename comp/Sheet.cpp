@@ -65,7 +65,7 @@ class SheetMaker {
     }
     sheet.layout = MakeLayout(composition_, withOverlaps, collector);
     const auto isInSpace = [](const Layer& layer) { return layer.space.has_value(); };
-    if (std::ranges::any_of(composition_.layers, isInSpace)) {
+    if (std::any_of(composition_.layers.begin(), composition_.layers.end(), isInSpace)) {
       sheet.scene = MakeScene(composition_, collector);
     }
     sheet.reports = collector.Reports();

@@ -197,7 +197,7 @@ constexpr std::partial_ordering operator<=>(const M_Ratio& a, const M_Ratio& b) 
   return int64_t{a.num} * b.den <=> int64_t{b.num} * a.den;
 }
 /// Whether both are the same number.
-constexpr bool operator==(const M_Ratio& a, const M_Ratio& b) { return std::is_eq(a <=> b); }
+constexpr bool operator==(const M_Ratio& a, const M_Ratio& b) { return (a <=> b) == 0; }
 
 /// \cond
 // Equal ratios have the same.

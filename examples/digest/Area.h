@@ -57,7 +57,7 @@ class Area {
     ForEachNumber(record, [&](const auto& number) {
       if constexpr (std::is_floating_point_v<std::remove_cvref_t<decltype(number)>>) {
         const double wide = number;
-        AddWord(wide != wide ? 0x7FF8u << 16 : std::bit_cast<uint64_t>(wide));
+        AddWord(wide != wide ? 0x7FF8u << 16 : BitCast<uint64_t>(wide));
       } else {
         AddWord(static_cast<uint64_t>(number));
       }

@@ -3,7 +3,6 @@
 #ifndef DIGEST_OPERANDS_H
 #define DIGEST_OPERANDS_H
 
-#include <bit>
 #include <cmath>
 #include <cstddef>
 #include <cstdint>
@@ -15,6 +14,12 @@
 #include "M_Utils.h"
 
 namespace digest {
+
+/// std::bit_cast(), which not every standard library has yet.
+template <class To, class From>
+To BitCast(const From& from) {
+  return __builtin_bit_cast(To, from);
+}
 
 /// Calls visit(number) for each number that a record is made of.
 template <class Record, class Visit>
@@ -111,9 +116,8 @@ class Operands {
     // At an edge, or one step to either side of it.
     if (kind < 6) {
       const int64_t step = int64_t{Below(3)} - 1;
-      return std::isfinite(edge) && edge != 0
-                 ? std::bit_cast<double>(std::bit_cast<int64_t>(edge) + step)
-                 : edge;
+      return std::isfinite(edge) && edge != 0 ? BitCast<double>(BitCast<int64_t>(edge) + step)
+                                              : edge;
     }
     // Any exponent that products can bear.
     const auto exponent = static_cast<int>(Below(600)) - 300;

@@ -78,7 +78,7 @@ std::string_view NextPlaceholder(const char** text) {
   const char* end = start + 1 + std::strcspn(start + 1, "%diouxXeEfFgGaAcCsSpnm");
   if (*end) ++end;
   *text = end;
-  return {start, end};
+  return {start, static_cast<size_t>(end - start)};
 }
 
 bool HaveSamePlaceholders(const char* a, const char* b) {

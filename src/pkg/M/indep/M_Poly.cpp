@@ -10,6 +10,7 @@
 
 #include "M_Matrix.h"
 #include "M_Rect.h"
+#include "Mp_Arith.h"
 #include "Mp_Lanes.h"
 #include "Mp_Tolerance.h"
 #include "Mp_Vector3.h"
@@ -24,8 +25,8 @@ using Vector3 = M_Vector3T<double>;
 template <class Point>
 bool IsSameBitwise(const Point& a, const Point& b) {
   using Word = std::conditional_t<sizeof a.x == sizeof(uint64_t), uint64_t, uint32_t>;
-  return std::bit_cast<Word>(a.x) == std::bit_cast<Word>(b.x) &&
-         std::bit_cast<Word>(a.y) == std::bit_cast<Word>(b.y);
+  return Mp::BitCast<Word>(a.x) == Mp::BitCast<Word>(b.x) &&
+         Mp::BitCast<Word>(a.y) == Mp::BitCast<Word>(b.y);
 }
 
 template <class Point>

@@ -87,7 +87,7 @@ bool Cancel(M_Ratio* r) { return Cancel(&r->num, &r->den); }
 
 // Writes a ratio in one piece: who copies it at once would have to wait for two.
 [[gnu::always_inline]] inline void Put(int32_t num, uint32_t den, M_Ratio* out) {
-  const auto both = std::bit_cast<uint64_t>(M_Ratio{num, den});
+  const auto both = Mp::BitCast<uint64_t>(M_Ratio{num, den});
   std::memcpy(out, &both, sizeof both);
 }
 

@@ -1,6 +1,6 @@
 /// \file
 /// The arithmetic that C++ leaves undefined or to the machine, written out once: wrapping sums and
-/// products, magnitudes, and the conversion of doubles that do not fit.
+/// products, magnitudes, the bits of a value, and the conversion of doubles that do not fit.
 #ifndef MP_ARITH_H
 #define MP_ARITH_H
 
@@ -31,6 +31,12 @@ constexpr int32_t WrapNegate(int32_t a) { return WrapSub(0, a); }
 
 /// |a|, with 2^31 for -2^31.
 constexpr uint32_t Magnitude(int32_t a) { return static_cast<uint32_t>(a < 0 ? WrapNegate(a) : a); }
+
+/// std::bit_cast(), which not every standard library has yet.
+template <class To, class From>
+constexpr To BitCast(const From& from) {
+  return __builtin_bit_cast(To, from);
+}
 
 /// d truncated towards zero. The most negative value stands for all that does not fit; a NaN fails
 /// both comparisons and goes the same way.
