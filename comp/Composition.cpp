@@ -4,13 +4,12 @@
 #include <charconv>
 #include <cmath>
 #include <initializer_list>
-#include <istream>
-#include <iterator>
 #include <nlohmann/json.hpp>
 #include <optional>
 #include <set>
 #include <utility>
 
+#include "JsonPlace.h"
 #include "Language.h"
 #include "Rates.h"
 #include "Timecode.h"
@@ -20,11 +19,18 @@ namespace {
 
 using Json = nlohmann::json;
 
+// What is wrong, and where in the tree of the file.
+struct Complaint {
+  std::string sentence;
+  std::vector<std::string> path;
+};
+
 // An object of the file that knows where it stands, so that every complaint can say so.
 class Fields {
  public:
-  Fields(const Json& json, std::string place, std::initializer_list<const char*> known)
-      : json_(json), place_(std::move(place)) {
+  Fields(const Json& json, std::string place, std::vector<std::string> path,
+         std::initializer_list<const char*> known)
+      : json_(json), place_(std::move(place)), path_(std::move(path)) {
     if (!json.is_object()) Complain(Tr("is not an object"));
     for (const auto& [key, value] : json.items()) {
       bool isKnown = false;
@@ -34,11 +40,11 @@ class Fields {
   }
 
   [[noreturn]] void Complain(const std::string& what) const {
-    throw InputError(Tr("{0} {1}.", {place_, what}));
+    throw Complaint{Tr("{0} {1}.", {place_, what}), path_};
   }
 
   [[noreturn]] void ComplainAbout(const std::string& field, const std::string& what) const {
-    throw InputError(Tr("{0}, field \"{1}\": {2}.", {place_, field, what}));
+    throw Complaint{Tr("{0}, field \"{1}\": {2}.", {place_, field, what}), Below(field)};
   }
 
   bool Has(const char* field) const { return json_.contains(field); }
@@ -116,10 +122,17 @@ class Fields {
     return Has(field) && Get(field).is_array() && Get(field).size() == 3;
   }
 
-  // An object in a field, or in the list of one.
-  Fields Sub(const char* field, const Json& json, const std::string& what,
+  // The object in a field.
+  Fields Sub(const char* field, std::initializer_list<const char*> known) const {
+    return {Get(field), Tr("{0}, field \"{1}\"", {place_, field}), Below(field), known};
+  }
+
+  // An object in the list of one.
+  Fields Sub(const char* field, size_t index, const std::string& what,
              std::initializer_list<const char*> known) const {
-    return {json, Tr("{0}, field \"{1}\"", {place_, field}) + what, known};
+    std::vector<std::string> path = Below(field);
+    path.push_back(std::to_string(index));
+    return {Get(field)[index], Tr("{0}, field \"{1}\"", {place_, field}) + what, path, known};
   }
 
   Size Pixels(const char* field) const {
@@ -168,8 +181,15 @@ class Fields {
     return {decimal->ratio, decimal->isExact ? "" : text};
   }
 
+  std::vector<std::string> Below(const std::string& field) const {
+    std::vector<std::string> path = path_;
+    path.push_back(field);
+    return path;
+  }
+
   const Json& json_;
   std::string place_;
+  std::vector<std::string> path_;
 };
 
 M_Vector2T<double> Center(const Size& size) { return {size.width / 2.0, size.height / 2.0}; }
@@ -204,15 +224,13 @@ SpacePlacement ReadSpacePlacement(const Fields& fields) {
   placement.position = fields.Triple("position");
   placement.scale = fields.Has("scale") ? fields.Triple("scale") : M_Vector3T<double>{1, 1, 1};
   if (fields.Has("orientation")) {
-    placement.orientation = ReadOrientation(
-        fields.Sub("orientation", fields.Get("orientation"), "", kOrientationFields));
+    placement.orientation = ReadOrientation(fields.Sub("orientation", kOrientationFields));
   }
   if (!fields.Has("keys")) return placement;
   const Json& keys = fields.Get("keys");
   if (!keys.is_array() || keys.empty()) fields.ComplainAbout("keys", Tr("is not a list of keys"));
-  for (const Json& json : keys) {
-    const std::string what = Tr(", key {0}", {std::to_string(placement.keys.size() + 1)});
-    const Fields key = fields.Sub("keys", json, what, kKeyFields);
+  for (size_t i = 0; i < keys.size(); ++i) {
+    const Fields key = fields.Sub("keys", i, Tr(", key {0}", {std::to_string(i + 1)}), kKeyFields);
     const int32_t frame = key.Whole("frame");
     if (!placement.keys.empty() && frame <= placement.keys.back().frame) {
       key.ComplainAbout("frame", Tr("does not lie behind that of the key before"));
@@ -256,8 +274,7 @@ Camera ReadCamera(const Fields& fields, const Size& frame) {
   const double distance = frame.width;
   Camera camera = {{center.x, center.y, -distance}, {center.x, center.y, 0}, {0, -1, 0}, distance};
   if (!fields.Has("camera")) return camera;
-  const Fields given =
-      fields.Sub("camera", fields.Get("camera"), "", {"eye", "target", "up", "zoom"});
+  const Fields given = fields.Sub("camera", {"eye", "target", "up", "zoom"});
   camera.eye = given.Triple("eye");
   camera.target = given.Triple("target");
   if (given.Has("up")) camera.up = given.Triple("up");
@@ -272,7 +289,7 @@ Layer ReadLayer(const Json& json, const std::string& fileName, size_t number,
   if (json.contains("name") && json["name"].is_string()) {
     place += Tr(" (\"{0}\")", {json["name"].get<std::string>()});
   }
-  const Fields fields(json, place,
+  const Fields fields(json, place, {"layers", std::to_string(number - 1)},
                       {"name", "sourceRate", "timeBase", "in", "out", "stretch", "size", "anchor",
                        "position", "scale", "rotation", "orientation", "keys"});
   Layer layer;
@@ -345,30 +362,26 @@ class Parser : public nlohmann::detail::json_sax_dom_parser<Json> {
   bool isInList_ = false;
 };
 
-// " (line 2, column 1)", for what is not the beginning.
-std::string Place(const std::string& text, size_t byte) {
-  if (byte == 0) return {};
-  const std::string_view before = std::string_view(text).substr(0, byte);
-  const auto lines = std::count(before.begin(), before.end(), '\n');
-  const size_t column = before.size() - (lines == 0 ? 0 : before.rfind('\n') + 1);
-  return Tr(" (line {0}, column {1})", {std::to_string(lines + 1), std::to_string(column + 1)});
+// What Parser found, as a sentence.
+[[noreturn]] void Fail(const Parser& parser, const std::string& text, const std::string& fileName) {
+  const size_t layer = parser.layer;
+  std::string place = layer == 0 ? Tr("{0}: composition", {fileName})
+                                 : Tr("{0}: layer {1}", {fileName, std::to_string(layer)});
+  if (!parser.field.empty()) place += Tr(", at or behind field \"{0}\"", {parser.field});
+  size_t byte = parser.byte;
+  std::string where;
+  if (byte > 0) {
+    const auto [line, column] = PlaceOf(text, byte);
+    where = Tr(" (line {0}, column {1})", {std::to_string(line), std::to_string(column)});
+  } else if (layer > 0) {
+    byte = FindPath(text, {"layers", std::to_string(layer - 1), parser.field});
+  }
+  const auto [line, column] = PlaceOf(text, byte);
+  throw InputError(Tr("{0}: {1}{2}.", {place, parser.complaint, where}), line, column);
 }
 
-}  // namespace
-
-Composition ReadComposition(std::istream& in, const std::string& fileName) {
-  const std::string text(std::istreambuf_iterator<char>(in), {});
-  Json json;
-  Parser parser(&json);
-  Json::sax_parse(text, &parser);
-  if (!parser.complaint.empty()) {
-    std::string place = parser.layer == 0
-                            ? Tr("{0}: composition", {fileName})
-                            : Tr("{0}: layer {1}", {fileName, std::to_string(parser.layer)});
-    if (!parser.field.empty()) place += Tr(", at or behind field \"{0}\"", {parser.field});
-    throw InputError(Tr("{0}: {1}{2}.", {place, parser.complaint, Place(text, parser.byte)}));
-  }
-  const Fields fields(json, Tr("{0}: composition", {fileName}),
+Composition Read(const Json& json, const std::string& fileName) {
+  const Fields fields(json, Tr("{0}: composition", {fileName}), {},
                       {"name", "frameRate", "start", "duration", "size", "camera", "layers"});
   Composition composition;
   composition.name = fields.Name();
@@ -389,6 +402,21 @@ Composition ReadComposition(std::istream& in, const std::string& fileName) {
         ReadLayer(layer, fileName, composition.layers.size() + 1, composition.size));
   }
   return composition;
+}
+
+}  // namespace
+
+Composition ReadComposition(const std::string& text, const std::string& fileName) {
+  Json json;
+  Parser parser(&json);
+  Json::sax_parse(text, &parser);
+  if (!parser.complaint.empty()) Fail(parser, text, fileName);
+  try {
+    return Read(json, fileName);
+  } catch (const Complaint& complaint) {
+    const auto [line, column] = PlaceOf(text, FindPath(text, complaint.path));
+    throw InputError(complaint.sentence, line, column);
+  }
 }
 
 }  // namespace comp

@@ -5,7 +5,6 @@
 
 #include <array>
 #include <cstdint>
-#include <iosfwd>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -19,7 +18,10 @@ namespace comp {
 /// A file that cannot be used. The text is a sentence that names the file, the layer and the field.
 class InputError : public std::runtime_error {
  public:
-  using std::runtime_error::runtime_error;
+  explicit InputError(const std::string& sentence, size_t lineOfFile = 0, size_t columnOfFile = 0)
+      : std::runtime_error(sentence), line(lineOfFile), column(columnOfFile) {}
+
+  size_t line, column;  ///< Of the file, from 1; 0 where they are not known.
 };
 
 /// A ratio of the file. Decimals are approximated; `given` is then the decimal, else empty.
@@ -97,8 +99,8 @@ struct Composition {
   std::vector<Layer> layers;
 };
 
-/// Reads a composition file (JSON). Throws InputError.
-Composition ReadComposition(std::istream& in, const std::string& fileName);
+/// The composition of a file (JSON). Throws InputError.
+Composition ReadComposition(const std::string& text, const std::string& fileName);
 
 }  // namespace comp
 

@@ -8,22 +8,11 @@ namespace {
 
 M_LRect ToRect(const Size& size) { return {0, 0, size.width, size.height}; }
 
-// The layer's anchor comes to lie at its position; about it the layer is scaled, then rotated.
-M_Matrix3 MakeMatrix(const Placement& placement) {
-  M_Matrix3 m;
-  M_SetIdentityMatrix(&m);
-  M_TranslateMatrix(&m, -placement.anchor.x, -placement.anchor.y);
-  M_ScaleMatrix(&m, placement.scale.x, placement.scale.y, 0, 0);
-  M_RotateMatrix(&m, placement.rotation, 0, 0);
-  M_TranslateMatrix(&m, placement.position.x, placement.position.y);
-  return m;
-}
-
 PlacedLayer Place(const Layer& layer, const Size& frame) {
   PlacedLayer placed = {};
   placed.name = layer.name;
   placed.size = layer.placement->size;
-  const M_Matrix3 m = MakeMatrix(*layer.placement);
+  const M_Matrix3 m = MatrixOf(*layer.placement);
   M_GetMatrixType(&m, &placed.matrixType);
   // Asked in space: the inversion in the plane takes a last pivot of 0 for no failure.
   M_Matrix4 inverse;
@@ -66,8 +55,19 @@ void FindOverlaps(std::vector<PlacedLayer>* layers) {
 
 }  // namespace
 
+M_Matrix3 MatrixOf(const Placement& placement) {
+  // The anchor comes to lie at the position; about it the layer is scaled, then rotated.
+  M_Matrix3 m;
+  M_SetIdentityMatrix(&m);
+  M_TranslateMatrix(&m, -placement.anchor.x, -placement.anchor.y);
+  M_ScaleMatrix(&m, placement.scale.x, placement.scale.y, 0, 0);
+  M_RotateMatrix(&m, placement.rotation, 0, 0);
+  M_TranslateMatrix(&m, placement.position.x, placement.position.y);
+  return m;
+}
+
 std::array<M_Vector2T<double>, 4> CornersOf(const Placement& placement) {
-  const M_Matrix3 m = MakeMatrix(placement);
+  const M_Matrix3 m = MatrixOf(placement);
   std::array<M_Vector2T<double>, 4> corners;
   M_FloatRect rect = {0, 0, static_cast<double>(placement.size.width),
                       static_cast<double>(placement.size.height)};

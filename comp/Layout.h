@@ -38,6 +38,9 @@ struct Layout {
   M_LRect all;                      ///< Encloses every layer.
 };
 
+/// From a layer to the frame.
+M_Matrix3 MatrixOf(const Placement& placement);
+
 /// Where a layer's corners lie in the frame: left top, right top, right bottom, left bottom.
 std::array<M_Vector2T<double>, 4> CornersOf(const Placement& placement);
 

@@ -169,6 +169,8 @@ std::string DrawVeil(const M_FloatRect& box, const Size& frame) {
 Picture Draw(const Composition& composition, const PictureOptions& options) {
   const Size& frame = *composition.size;
   const Sheet sheet = MakeSheet(composition);
+  // What is reported here is in the sheet's reports.
+  const ReportCollector collector;
   const std::vector<Shape> shapes = MakeShapes(composition, sheet, options.frame);
   const int margin = std::max(frame.width, frame.height) / 4;
   const int letters = (frame.width + 2 * margin) / 72 + 1;

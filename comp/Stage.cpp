@@ -6,7 +6,6 @@
 #include <utility>
 
 #include "Layout.h"
-#include "Reports.h"
 #include "Scene.h"
 
 namespace comp {
@@ -59,8 +58,6 @@ Shape MakeSolid(const Layer& layer, const M_Matrix4& view, const M_Matrix4& proj
 
 std::vector<Shape> MakeShapes(const Composition& composition, const Sheet& sheet,
                               std::optional<double> frame) {
-  // What is reported here is in the sheet's reports.
-  ReportCollector collector;
   const M_Matrix4 view = MakeView(*composition.camera);
   const M_Matrix4 projection = MakeProjection(*composition.camera, *composition.size);
   std::vector<Shape> shapes;

@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
-#include <sstream>
 
 #include "Language.h"
 #include "M_Ops.h"
@@ -37,21 +36,16 @@ std::string RatioText(const M_Ratio& ratio) {
 }
 
 std::string RateText(const M_Ratio& rate) {
-  std::ostringstream text;
-  if (rate.den == 1) {
-    text << rate;
-  } else {
-    // As few digits as tell it.
-    char decimal[32];
-    for (int digits = 5; digits < 17; ++digits) {
-      std::snprintf(decimal, sizeof decimal, "%.*g", digits,
-                    rate.num / static_cast<double>(rate.den));
-      const auto read = ToRatio(decimal, true);
-      if (read && read->ratio == rate) break;
-    }
-    text << decimal << " (" << rate << ')';
+  if (rate.den == 1) return std::to_string(rate.num);
+  // As few digits as tell it.
+  char decimal[32];
+  for (int digits = 5; digits < 17; ++digits) {
+    std::snprintf(decimal, sizeof decimal, "%.*g", digits,
+                  rate.num / static_cast<double>(rate.den));
+    const auto read = ToRatio(decimal, true);
+    if (read && read->ratio == rate) break;
   }
-  return text.str();
+  return std::string(decimal).append(" (").append(RatioText(rate)).append(")");
 }
 
 std::string SecondsText(const M_Ratio& seconds, double maxError) {

@@ -128,9 +128,8 @@ std::string MakeSheets(const Arguments& arguments, comp::Progress* progress) {
       continue;
     }
     if (arguments.asCsv) throw comp::InputError(Tr("{0}: --csv is for timelines.", {fileName}));
-    std::istringstream stream(file);
     const comp::Sheet sheet =
-        comp::MakeSheet(comp::ReadComposition(stream, fileName), arguments.withOverlaps);
+        comp::MakeSheet(comp::ReadComposition(file, fileName), arguments.withOverlaps);
     documents.push_back(arguments.asJson ? comp::ToJson(sheet)
                                          : comp::ToTable(sheet, arguments.mayDrop));
   }
@@ -206,8 +205,7 @@ std::string MakePicture(const Arguments& arguments, comp::Progress* progress) {
     WriteFile(arguments.svg, comp::Draw(comp::ReadOtio(given, fileName)[0], arguments.mayDrop));
     return "";
   }
-  std::istringstream stream(given);
-  const comp::Composition composition = comp::ReadComposition(stream, fileName);
+  const comp::Composition composition = comp::ReadComposition(given, fileName);
   if (!composition.size) {
     throw comp::InputError(Tr("{0}: composition has no \"size\" to be drawn in.", {fileName}));
   }

@@ -1,7 +1,5 @@
 // The readers of compositions and timelines, and what is made of what they have read.
 
-#include <sstream>
-
 #include "Composition.h"
 #include "Otio.h"
 #include "Picture.h"
@@ -23,8 +21,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
       comp::Draw(timelines[0], true);
       return 0;
     }
-    std::istringstream stream(text);
-    const comp::Composition composition = comp::ReadComposition(stream, "input");
+    const comp::Composition composition = comp::ReadComposition(text, "input");
     const comp::Sheet sheet = comp::MakeSheet(composition);
     comp::ToJson(sheet);
     if (composition.size) comp::Draw(composition, {});
