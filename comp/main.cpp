@@ -3,7 +3,6 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <clocale>
 #include <cmath>
 #include <cstdio>
@@ -19,6 +18,7 @@
 #include "M_Utils.h"
 #include "Otio.h"
 #include "Picture.h"
+#include "Rates.h"
 #include "SheetText.h"
 #include "TimelinePicture.h"
 #include "TimelineText.h"
@@ -135,10 +135,8 @@ std::string MakeSheets(const Arguments& arguments) {
 void AddOptions(CLI::App* app, Arguments* arguments) {
   const CLI::Validator finite(
       [](std::string& text) {
-        double number;
-        const auto [rest, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-        const bool isFinite = error == std::errc() && *rest == '\0' && std::isfinite(number);
-        return isFinite ? std::string() : text + " is not a number";
+        const auto number = comp::ToDouble(text);
+        return number && std::isfinite(*number) ? std::string() : text + " is not a number";
       },
       "");
   comp::PictureOptions& picture = arguments->picture;
