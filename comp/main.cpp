@@ -3,7 +3,6 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <clocale>
 #include <cmath>
 #include <cstdio>
@@ -20,6 +19,7 @@
 #include "M_Utils.h"
 #include "Otio.h"
 #include "Picture.h"
+#include "Rates.h"
 #include "SheetText.h"
 #include "Terminal.h"
 #include "Text.h"
@@ -150,10 +150,8 @@ std::string MakeSheets(const Arguments& arguments, comp::Progress* progress) {
 void AddOptions(CLI::App* app, Arguments* arguments) {
   const CLI::Validator finite(
       [](std::string& text) {
-        double number;
-        const auto [rest, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-        const bool isFinite = error == std::errc() && *rest == '\0' && std::isfinite(number);
-        return isFinite ? std::string() : Tr("{0} is not a number", {text});
+        const auto number = comp::ToDouble(text);
+        return number && std::isfinite(*number) ? std::string() : Tr("{0} is not a number", {text});
       },
       "");
   comp::PictureOptions& picture = arguments->picture;

@@ -197,7 +197,9 @@ constexpr std::partial_ordering operator<=>(const M_Ratio& a, const M_Ratio& b) 
   return int64_t{a.num} * b.den <=> int64_t{b.num} * a.den;
 }
 /// Whether both are the same number.
-constexpr bool operator==(const M_Ratio& a, const M_Ratio& b) { return (a <=> b) == 0; }
+constexpr bool operator==(const M_Ratio& a, const M_Ratio& b) {
+  return (a <=> b) == std::partial_ordering::equivalent;
+}
 
 /// \cond
 // Equal ratios have the same.

@@ -21,7 +21,9 @@ everywhere_one() {
     echo "The build of $name failed."
     return 1
   }
-  if LC_ALL=C $runner "$folder/bin/digest" --compare examples/digest/expected.txt >"$folder.digests" 2>"$folder.differences"; then
+  program=$folder/bin/digest
+  [ -e "$program" ] || program=$program.js
+  if LC_ALL=C $runner "$program" --compare examples/digest/expected.txt >"$folder.digests" 2>"$folder.differences"; then
     result='the same'
   else
     result=DIFFERENT
@@ -71,6 +73,10 @@ everywhere() {
       everywhere_one $machine$optimised $machine-linux-gnu-g++ "$optimised" "$emulator -L /usr/$machine-linux-gnu" \
         -DCMAKE_SYSTEM_NAME=Linux -DCMAKE_SYSTEM_PROCESSOR=$machine
     done
+  done
+  need_packages emscripten node-acorn nodejs
+  for optimised in -O0 -O2 '-O3 -msimd128'; do
+    everywhere_one "wasm${optimised% *}" em++ "$optimised" node -DCMAKE_TOOLCHAIN_FILE=cmake/Emscripten.cmake
   done
   if [ "$everywhere_failures" -gt 0 ]; then
     echo "$everywhere_failures builds give other bits."
