@@ -1,0 +1,390 @@
+// A viewer of compositions and timelines. What it shows, the library has worked out.
+
+import broadcast from '../comp/samples/broadcast.json';
+import film from '../comp/samples/film.json';
+import harbour from '../comp/samples/harbour.otio';
+import sound from '../comp/samples/sound.json';
+import space from '../comp/samples/space.json';
+import stageSample from '../comp/samples/stage.json';
+import makeViewer from 'viewer';
+import { compare } from './bits.js';
+import { $, element } from './dom.js';
+import { Editor } from './editor.js';
+import { showItem, showLayer } from './inspector.js';
+import { Lanes } from './lanes.js';
+import { colorOf, Stage } from './stage.js';
+
+const kSamples = {
+  'space.json': space, 'stage.json': stageSample, 'film.json': film, 'broadcast.json': broadcast, 'sound.json': sound,
+  'harbour.otio': harbour,
+};
+const kMostText = 2_000_000; // Of a file in the pane.
+const kMostShared = 50_000; // Of a file in a link.
+
+const viewer = new (await makeViewer()).Viewer();
+let file = null; // What Viewer.open() told.
+let name = ''; // Of the file.
+let given = ''; // Its text.
+let frame = 0; // From the start.
+let selected = { lane: -1, item: -1 };
+let hit = -1;
+let pointer = null; // In the frame.
+let playing = null; // When, and from which frame.
+let isStale = { shapes: true, details: true };
+let isAsked = false;
+
+function say(sentence) {
+  $('message').textContent = sentence;
+  $('message').hidden = sentence === '';
+}
+
+// One picture for all that changes before the next is due.
+function refresh(what = {}) {
+  Object.assign(isStale, what);
+  if (isAsked) return;
+  isAsked = true;
+  requestAnimationFrame(() => {
+    isAsked = false;
+    paint();
+  });
+}
+
+const atFrame = () => file.start + frame;
+const timeOf = (f) => JSON.parse(viewer.timeOf(f));
+
+function paint() {
+  if (playing) {
+    const next = (playing.frame + viewer.framesIn(Math.round(performance.now() - playing.since))) % Math.max(1, file.duration);
+    if (next !== frame) setFrame(next);
+  }
+  if (isStale.shapes) {
+    stage.update(atFrame());
+    point();
+  }
+  stage.draw(isComposition() ? selected.lane : -1, hit);
+  lanes.draw(frame, selected.lane, (f) => timeOf(file.start + f).timecode);
+  if (isStale.details && !playing) details();
+  isStale = { shapes: false, details: isStale.details && Boolean(playing) };
+  if (playing) refresh();
+}
+
+const isComposition = () => file.kind === 'composition';
+
+function setFrame(next) {
+  frame = Math.max(0, Math.min(Math.max(1, file.duration) - 1, next));
+  $('scrub').value = String(frame);
+  const time = timeOf(atFrame());
+  $('scrub').setAttribute('aria-valuetext', time.timecode);
+  $('time').textContent = `${time.timecode} · frame ${atFrame()} · ${time.seconds ?? '?'} s`;
+  refresh({ shapes: true, details: true });
+}
+
+function play(isOn) {
+  playing = isOn ? { since: performance.now(), frame } : null;
+  $('play').textContent = isOn ? 'Pause' : 'Play';
+  $('play').setAttribute('aria-pressed', String(isOn));
+  refresh({ details: true });
+}
+
+// The layers under the pointer.
+function point() {
+  const hits = pointer && isComposition() ? JSON.parse(viewer.hits(...pointer, Number($('tolerance').value))) : [];
+  hit = hits.length > 0 ? hits[0].number : -1;
+  $('hits').replaceChildren(...hits.slice(0, 50).map((h) => {
+    const b = element('button', { type: 'button' }, `${h.name.slice(0, 80)}, ${Number(h.distance.toPrecision(7))} px from its nearest edge`);
+    b.dataset.exact = String(h.distance);
+    b.style.borderLeft = `0.6em solid ${colorOf(h.number)}`;
+    b.addEventListener('click', () => select(h.number));
+    return element('li', {}, b);
+  }));
+}
+
+function details() {
+  const { lane, item } = selected;
+  $('number').value = lane < 0 ? '' : String(lane + 1);
+  if (lane < 0) return $('details').replaceChildren();
+  if (isComposition()) return showLayer($('details'), JSON.parse(viewer.layer(lane, atFrame())));
+  const found = file.tracks[lane]?.items[item];
+  if (found) showItem($('details'), found);
+  else $('details').replaceChildren(`Track "${(file.tracks[lane]?.name ?? '').slice(0, 80)}"`);
+}
+
+function select(lane, item = -1) {
+  selected = { lane, item };
+  if (lane >= 0) lanes.show(lane);
+  details();
+  refresh();
+}
+
+function showReports() {
+  const list = isComposition()
+    ? [...file.reports, ...JSON.parse(viewer.reports())].map((r) => `[${r.id}] ${r.text}${r.layer ? ` ("${r.layer.slice(0, 80)}")` : ''}`)
+    : file.remarks;
+  const sentences = [...new Set(list)];
+  $('tabReports').textContent = sentences.length ? `Reports (${sentences.length})` : 'Reports';
+  $('reports').replaceChildren(...(sentences.length ? sentences.slice(0, 1000) : ['Nothing.']).map((s) => element('li', {}, s)));
+}
+
+function lanesOf(opened) {
+  if (opened.kind === 'composition') {
+    return opened.names.map((n, i) => ({
+      name: n,
+      items: opened.ins[i] === null || opened.outs[i] === null ? []
+        : [{ name: n, kind: 'layer', in: opened.ins[i] - opened.start, out: opened.outs[i] - opened.start }],
+    }));
+  }
+  return opened.tracks.map((track, i) => ({
+    name: track.name || `${track.kind} ${i + 1}`,
+    items: track.items.map((item) => ({ name: item.name, kind: item.kind, in: item.recordIn.frame, out: item.recordOut.frame })),
+  }));
+}
+
+// Opens a text; false, with everything as it was, where it cannot be used.
+function open(text, fileName, isEdited = false) {
+  let opened;
+  try {
+    opened = JSON.parse(viewer.open(text, fileName));
+  } catch {
+    opened = { error: `${fileName}: is too large for this page.`, line: 0 };
+  }
+  if (!isEdited) editor.text = text.length <= kMostText ? text : '';
+  if (opened.error) {
+    say(opened.error);
+    editor.show(opened);
+    return false;
+  }
+  [file, name, given] = [opened, fileName, text];
+  say('');
+  editor.show(null);
+  $('title').textContent = document.title = `${file.name.slice(0, 200)} · ${file.rate} frames a second`;
+  $('scrub').max = String(Math.max(1, file.duration) - 1);
+  $('number').max = String(isComposition() ? file.names.length : file.tracks.length);
+  if (!isEdited) {
+    play(false);
+    selected = { lane: -1, item: -1 };
+    frame = 0;
+  }
+  stage.open(isComposition() ? file : { names: [], size: null });
+  lanes.open(lanesOf(file), file.duration);
+  setFrame(frame);
+  showReports();
+  return true;
+}
+
+async function openFile(chosen) {
+  try {
+    if (!open(await chosen.text(), chosen.name)) return;
+    $('sample').value = '';
+  } catch {
+    say(`${chosen.name}: cannot be read.`);
+  }
+}
+
+function save(text, fileName, type) {
+  const url = URL.createObjectURL(new Blob([text], { type }));
+  const a = element('a', { href: url, download: fileName });
+  a.click();
+  setTimeout(() => URL.revokeObjectURL(url), 1000);
+}
+
+async function copy(text) {
+  try {
+    await navigator.clipboard.writeText(text);
+  } catch {
+    const area = element('textarea');
+    area.value = text;
+    document.body.append(area);
+    area.select();
+    document.execCommand('copy');
+    area.remove();
+  }
+}
+
+// What a link keeps.
+function state() {
+  const isSample = kSamples[name] === given;
+  return {
+    name, text: isSample || given.length > kMostShared ? undefined : given, frame, lane: selected.lane, item: selected.item,
+    camera: viewer.camera(), language: $('language').value, drop: $('drop').checked, tolerance: $('tolerance').value,
+  };
+}
+
+function restore() {
+  let kept = {};
+  try {
+    kept = JSON.parse(decodeURIComponent(location.hash.slice(1)));
+  } catch {
+    // A link that was cut shows the first sample.
+  }
+  const text = typeof kept.text === 'string' ? kept.text : kSamples[kept.name];
+  if (['en', 'de', 'fr', 'ja'].includes(kept.language)) $('language').value = kept.language;
+  viewer.setLanguage($('language').value);
+  $('drop').checked = kept.drop === true;
+  viewer.setDropFrame($('drop').checked);
+  setTolerance(kept.tolerance);
+  if (!(text !== undefined && open(text, String(kept.name)))) open(space, 'space.json');
+  $('sample').value = kSamples[name] === given ? name : '';
+  if (typeof kept.camera === 'string') viewer.setCamera(kept.camera);
+  if (Number.isSafeInteger(kept.frame)) setFrame(kept.frame);
+  const count = isComposition() ? file.names.length : file.tracks.length;
+  if (Number.isInteger(kept.lane) && kept.lane >= 0 && kept.lane < count) select(kept.lane, kept.item);
+  refresh({ shapes: true, details: true });
+}
+
+function setTolerance(value) {
+  const tolerance = Number(value);
+  $('tolerance').value = String(tolerance >= 0 ? tolerance : 0);
+  $('toleranceValue').textContent = $('tolerance').value;
+}
+
+const stage = new Stage($('stage'), viewer, {
+  pointed(x, y) {
+    pointer = [x, y];
+    point();
+    refresh();
+  },
+  left() {
+    pointer = null;
+    point();
+    refresh();
+  },
+  picked(x, y) {
+    pointer = [x, y];
+    point();
+    if (hit >= 0) select(hit);
+  },
+  moved() {
+    refresh({ shapes: true, details: true });
+    showReports();
+  },
+});
+const lanes = new Lanes($('lanes'), {
+  seeked(f) {
+    play(false);
+    setFrame(f);
+  },
+  selected: select,
+  scrolled: () => file && refresh(),
+});
+const editor = new Editor((text) => open(text, name, true));
+
+$('sample').append(element('option', { value: '' }, '—'), ...Object.keys(kSamples).map((s) => element('option', { value: s }, s)));
+$('sample').addEventListener('change', (e) => e.target.value && open(kSamples[e.target.value], e.target.value));
+$('file').addEventListener('change', (e) => {
+  if (e.target.files[0]) openFile(e.target.files[0]);
+  e.target.value = '';
+});
+$('language').addEventListener('change', (e) => {
+  viewer.setLanguage(e.target.value);
+  open(editor.text || given, name, true);
+});
+$('drop').addEventListener('change', (e) => {
+  viewer.setDropFrame(e.target.checked);
+  open(given, name, true);
+});
+$('play').addEventListener('click', () => play(!playing));
+$('stop').addEventListener('click', () => {
+  play(false);
+  setFrame(0);
+});
+for (const [id, step] of [['back', -1], ['forward', 1]]) {
+  $(id).addEventListener('click', () => {
+    play(false);
+    setFrame(frame + step);
+  });
+}
+$('scrub').addEventListener('input', (e) => {
+  play(false);
+  setFrame(Number(e.target.value));
+});
+$('reset').addEventListener('click', () => {
+  viewer.resetCamera();
+  refresh({ shapes: true, details: true });
+});
+for (const option of ['hull', 'bounds', 'names']) {
+  $(option).addEventListener('change', (e) => {
+    stage.options[option] = e.target.checked;
+    refresh({ shapes: true });
+  });
+}
+$('tolerance').addEventListener('input', (e) => {
+  setTolerance(e.target.value);
+  point();
+  refresh();
+});
+$('number').addEventListener('change', (e) => {
+  const lane = Number(e.target.value) - 1;
+  if (lane >= 0 && lane < Number(e.target.max)) select(lane, isComposition() ? -1 : 0);
+});
+$('export').addEventListener('click', () => {
+  const svg = viewer.svg(atFrame());
+  if (svg) save(svg, `${name}.svg`, 'image/svg+xml');
+  else say(`${name}: without a size there is no picture.`);
+});
+$('sheet').addEventListener('click', () => save(viewer.sheet(), `${name}.sheet.json`, 'application/json'));
+$('link').addEventListener('click', () => {
+  location.hash = encodeURIComponent(JSON.stringify(state()));
+  copy(location.href);
+  if (given.length > kMostShared && kSamples[name] !== given) say('The file is too large for a link: it keeps all but the file.');
+});
+$('run').addEventListener('click', () => compare(viewer));
+$('details').addEventListener('click', (e) => e.target.dataset?.exact !== undefined && copy(e.target.dataset.exact));
+window.addEventListener('hashchange', restore);
+window.addEventListener('resize', () => refresh());
+matchMedia('(prefers-color-scheme: dark)').addEventListener('change', () => refresh());
+
+const tabs = [...document.querySelectorAll('[role=tab]')];
+function showTab(tab) {
+  for (const t of tabs) {
+    const isShown = t === tab;
+    t.setAttribute('aria-selected', String(isShown));
+    t.tabIndex = isShown ? 0 : -1;
+    $(t.getAttribute('aria-controls')).hidden = !isShown;
+  }
+}
+for (const tab of tabs) {
+  tab.addEventListener('click', () => showTab(tab));
+  tab.addEventListener('keydown', (e) => {
+    const step = { ArrowLeft: -1, ArrowRight: 1 }[e.key];
+    if (!step) return;
+    const next = tabs[(tabs.indexOf(tab) + step + tabs.length) % tabs.length];
+    showTab(next);
+    next.focus();
+  });
+}
+$('lanes').addEventListener('keydown', (e) => {
+  const count = isComposition() ? file.names.length : file.tracks.length;
+  if (e.key === 'ArrowDown' || e.key === 'ArrowUp') {
+    select(Math.max(0, Math.min(count - 1, selected.lane + (e.key === 'ArrowDown' ? 1 : -1))), isComposition() ? -1 : 0);
+  } else if (e.key === 'ArrowLeft' || e.key === 'ArrowRight') {
+    const step = e.key === 'ArrowRight' ? 1 : -1;
+    if (isComposition()) setFrame(frame + step);
+    else select(selected.lane, Math.max(0, selected.item + step));
+  } else if (e.key === 'Enter' && selected.lane >= 0) {
+    const item = lanes.lanes[selected.lane].items[Math.max(0, selected.item)];
+    if (item) setFrame(item.in);
+  } else {
+    return;
+  }
+  e.preventDefault();
+});
+document.addEventListener('keydown', (e) => {
+  if (e.target.closest?.('input, textarea, select, button')) return;
+  if (e.key === ' ') play(!playing);
+  else if (e.key === ',') setFrame(frame - 1);
+  else if (e.key === '.') setFrame(frame + 1);
+  else return;
+  e.preventDefault();
+});
+document.addEventListener('dragover', (e) => {
+  e.preventDefault();
+  document.body.classList.add('dropping');
+});
+document.addEventListener('dragleave', () => document.body.classList.remove('dropping'));
+document.addEventListener('drop', (e) => {
+  e.preventDefault();
+  document.body.classList.remove('dropping');
+  if (e.dataTransfer.files[0]) openFile(e.dataTransfer.files[0]);
+});
+
+restore();
