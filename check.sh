@@ -1,7 +1,8 @@
 #!/bin/sh
 # Installs what is missing, builds, and runs every test.
 # --all: also with clang++ and clang-tidy, with the sanitizers, as a static library with baseline vectors
-# only, and unoptimised; makes the reference, tries the Python package, fuzzes for a moment, and tries the packages.
+# only, and unoptimised; makes the reference, tries the Python package and the viewer, fuzzes for a moment, and tries the
+# packages.
 # --everywhere: instead, whether all builds on all processors give the same bits.
 # --fuzz SECONDS: instead, the fuzz targets, each for so long.
 set -eu
@@ -38,7 +39,7 @@ need_packages g++ cmake ninja-build gettext nlohmann-json3-dev libcli11-dev libg
   binutils clang clang-format clang-tidy abigail-tools gdb perl python3 locales
 
 echo "Checking the format ..."
-find include src host comp examples tests bench fuzz python -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror
+find include src host comp examples tests bench fuzz python web -name '*.h' -o -name '*.cpp' | xargs clang-format --dry-run -Werror
 
 for preset in $presets; do
   build_preset "$preset"
@@ -58,6 +59,8 @@ if [ "$presets" != release ]; then
   ./docs.sh
   . scripts/python.sh
   python_package
+  . scripts/web.sh
+  try_viewer
   . scripts/fuzz.sh
   fuzz 8
   ./package.sh --try

@@ -332,7 +332,7 @@ class Parser : public nlohmann::detail::json_sax_dom_parser<Json> {
     return Base::end_object();
   }
   bool start_array(std::size_t size) {
-    if (keys_.size() == 1) isInList_ = true;
+    if (keys_.size() == 1) isInList_ = field == "layers";
     return Base::start_array(size);
   }
   bool key(std::string& name) {

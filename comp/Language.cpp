@@ -15,8 +15,8 @@ constexpr char kDomain[] = "comp";
 bool BindCatalogues() {
   std::error_code error;
   const auto program = std::filesystem::canonical("/proc/self/exe", error);
-  // A page has no such file, and its catalogues at the root.
-  const auto folder = (error ? "/bin" : program.parent_path()) / COMP_RELATIVE_LOCALE_FOLDER;
+  // A page is no file, and has its catalogues at the root.
+  const auto folder = error ? "/share/locale" : program.parent_path() / COMP_RELATIVE_LOCALE_FOLDER;
   return bindtextdomain(kDomain, folder.c_str()) && bind_textdomain_codeset(kDomain, "UTF-8");
 }
 

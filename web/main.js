@@ -30,7 +30,8 @@ let selected = { lane: -1, item: -1 };
 let hit = -1;
 let pointer = null; // In the frame.
 let playing = null; // When, and from which frame.
-let isStale = { shapes: true, details: true };
+let hits = { count: 0, layers: [] };
+let isStale = { shapes: true, details: true, hits: true };
 let isAsked = false;
 
 function say(sentence) {
@@ -60,11 +61,13 @@ function paint() {
   if (isStale.shapes) {
     stage.update(atFrame());
     point();
+    if (!playing) showReports();
   }
-  stage.draw(isComposition() ? selected.lane : -1, hit);
+  stage.draw(isComposition() ? selected.lane : -1, hit, Number($('tolerance').value));
   lanes.draw(frame, selected.lane, (f) => timeOf(file.start + f).timecode);
+  if (isStale.hits) showHits();
   if (isStale.details && !playing) details();
-  isStale = { shapes: false, details: isStale.details && Boolean(playing) };
+  isStale = { shapes: false, details: isStale.details && Boolean(playing), hits: false };
   if (playing) refresh();
 }
 
@@ -86,17 +89,23 @@ function play(isOn) {
   refresh({ details: true });
 }
 
-// The layers under the pointer.
+// The layers under the pointer; their list with the next picture.
 function point() {
-  const hits = pointer && isComposition() ? JSON.parse(viewer.hits(...pointer, Number($('tolerance').value))) : [];
-  hit = hits.length > 0 ? hits[0].number : -1;
-  $('hits').replaceChildren(...hits.slice(0, 50).map((h) => {
+  const isOver = pointer && isComposition();
+  hits = isOver ? JSON.parse(viewer.hits(...pointer, Number($('tolerance').value))) : { count: 0, layers: [] };
+  hit = hits.count > 0 ? hits.layers[0].number : -1;
+  refresh({ hits: true });
+}
+
+function showHits() {
+  const more = hits.count - hits.layers.length;
+  $('hits').replaceChildren(...hits.layers.map((h) => {
     const b = element('button', { type: 'button' }, `${h.name.slice(0, 80)}, ${Number(h.distance.toPrecision(7))} px from its nearest edge`);
     b.dataset.exact = String(h.distance);
     b.style.borderLeft = `0.6em solid ${colorOf(h.number)}`;
     b.addEventListener('click', () => select(h.number));
     return element('li', {}, b);
-  }));
+  }), ...(more > 0 ? [element('li', {}, `and ${more} more`)] : []));
 }
 
 function details() {
@@ -164,10 +173,10 @@ function open(text, fileName, isEdited = false) {
     selected = { lane: -1, item: -1 };
     frame = 0;
   }
+  document.body.dataset.shows = isComposition() ? 'layers' : 'tracks';
   stage.open(isComposition() ? file : { names: [], size: null });
   lanes.open(lanesOf(file), file.duration);
   setFrame(frame);
-  showReports();
   return true;
 }
 
@@ -241,12 +250,10 @@ const stage = new Stage($('stage'), viewer, {
   pointed(x, y) {
     pointer = [x, y];
     point();
-    refresh();
   },
   left() {
     pointer = null;
     point();
-    refresh();
   },
   picked(x, y) {
     pointer = [x, y];
@@ -255,7 +262,6 @@ const stage = new Stage($('stage'), viewer, {
   },
   moved() {
     refresh({ shapes: true, details: true });
-    showReports();
   },
 });
 const lanes = new Lanes($('lanes'), {
@@ -310,7 +316,6 @@ for (const option of ['hull', 'bounds', 'names']) {
 $('tolerance').addEventListener('input', (e) => {
   setTolerance(e.target.value);
   point();
-  refresh();
 });
 $('number').addEventListener('change', (e) => {
   const lane = Number(e.target.value) - 1;
@@ -323,7 +328,7 @@ $('export').addEventListener('click', () => {
 });
 $('sheet').addEventListener('click', () => save(viewer.sheet(), `${name}.sheet.json`, 'application/json'));
 $('link').addEventListener('click', () => {
-  location.hash = encodeURIComponent(JSON.stringify(state()));
+  history.replaceState(null, '', `#${encodeURIComponent(JSON.stringify(state()))}`);
   copy(location.href);
   if (given.length > kMostShared && kSamples[name] !== given) say('The file is too large for a link: it keeps all but the file.');
 });

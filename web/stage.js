@@ -3,7 +3,7 @@
 const kColors = ['#4e79a7', '#f28e2b', '#e15759', '#76b7b2', '#59a14f', '#edc948', '#b07aa1', '#9c755f'];
 export const colorOf = (number) => kColors[number % kColors.length];
 
-const kMostNames = 300; // Dashes and names of more than that are no help.
+const kMostNames = 300; // Names and edges of more layers than that are no help.
 
 // The flat list of Viewer.shapes() as records.
 function parse(numbers) {
@@ -77,13 +77,14 @@ export class Stage {
     this.hull = this.options.hull && this.size ? this.viewer.hull().slice() : [];
   }
 
-  draw(selected, hit) {
+  draw(selected, hit, tolerance) {
     const place = this.layout();
-    const context = this.canvas.getContext('2d');
+    const context = this.canvas.getContext('2d', { alpha: false });
     const style = getComputedStyle(document.documentElement);
     const color = (name) => style.getPropertyValue(name);
     context.setTransform(1, 0, 0, 1, 0, 0);
-    context.clearRect(0, 0, this.canvas.width, this.canvas.height);
+    context.fillStyle = color('--back');
+    context.fillRect(0, 0, this.canvas.width, this.canvas.height);
     if (!place) {
       context.fillStyle = color('--quiet');
       context.font = `${16 * (window.devicePixelRatio || 1)}px sans-serif`;
@@ -105,7 +106,7 @@ export class Stage {
         context.fill();
         context.globalAlpha = 1;
       }
-      context.stroke();
+      if (shape.isEdgeOn || this.shapes.length <= kMostNames) context.stroke();
       if (shape.cut) {
         context.strokeStyle = color('--bad');
         context.lineWidth = 3 * line;
@@ -138,6 +139,12 @@ export class Stage {
       trace(context, shape.points, !shape.isEdgeOn);
       context.stroke();
       context.setLineDash([]);
+      if (number !== hit || tolerance === 0) continue;
+      // How far beside it a hit may be.
+      context.globalAlpha = 0.25;
+      context.lineWidth = 2 * tolerance;
+      context.stroke();
+      context.globalAlpha = 1;
     }
     if (this.options.names && this.shapes.length <= kMostNames) this.drawNames(context, place, color);
   }

@@ -80,6 +80,7 @@ class Viewer {
  public:
   Viewer() {
     U_SetLogCallback([](void*, int32_t, const char*, const char*, const char*) {}, nullptr);
+    U_SetMessageFolder("/share/locale");
     M_Birth(M_SERVICE_TRIG | M_SERVICE_FCMD, nullptr);
   }
 
@@ -95,10 +96,12 @@ class Viewer {
         auto timelines = comp::ReadOtio(text, name);
         timelines_ = std::move(timelines);
         composition_.reset();
+        reports_.clear();
         return OpenedTimelines();
       }
       comp::Composition composition = comp::ReadComposition(text, name);
       timelines_.clear();
+      reports_.clear();
       composition_ = std::move(composition);
       sheet_ = comp::MakeSheet(*composition_);
       camera_ = composition_->camera;
@@ -183,13 +186,20 @@ class Viewer {
     return View();
   }
 
-  /// The layers under a point of what was on the screen last, from front to back.
+  /// The layers under a point of what was on the screen last, from front to back: how many, and
+  /// the first of them with the distance of their nearest edge.
   std::string Hits(double x, double y, double tolerance) const {
+    constexpr size_t kMost = 20;
+    const Point point = {x, y};
+    size_t count = 0;
     Json list = Json::array();
-    for (const comp::Hit& hit : comp::HitsAt(shapes_, {x, y}, tolerance)) {
-      list.push_back({{"number", hit.number}, {"name", hit.name}, {"distance", hit.distance}});
+    for (auto shape = shapes_.rbegin(); shape != shapes_.rend(); ++shape) {
+      if (!shape->IsHit(point, tolerance) || ++count > kMost) continue;
+      list.push_back({{"number", shape->number},
+                      {"name", *shape->name},
+                      {"distance", shape->EdgeDistance(point)}});
     }
-    return Text(list);
+    return Text({{"count", count}, {"layers", std::move(list)}});
   }
 
   /// What the library reported while the shapes were made.
