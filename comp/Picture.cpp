@@ -170,8 +170,8 @@ Picture Draw(const Composition& composition, const PictureOptions& options) {
   const Size& frame = *composition.size;
   const Sheet sheet = MakeSheet(composition);
   // What is reported here is in the sheet's reports.
-  const ReportCollector collector;
-  const std::vector<Shape> shapes = MakeShapes(composition, sheet, options.frame);
+  ReportCollector collector;
+  const std::vector<Shape> shapes = MakeShapes(composition, sheet, options.frame, collector);
   const int margin = std::max(frame.width, frame.height) / 4;
   const int letters = (frame.width + 2 * margin) / 72 + 1;
   const M_FloatRect box = {-1.0 * margin, -1.0 * margin, frame.width + 1.0 * margin,

@@ -57,7 +57,7 @@ Shape MakeSolid(const Layer& layer, const M_Matrix4& view, const M_Matrix4& proj
 }  // namespace
 
 std::vector<Shape> MakeShapes(const Composition& composition, const Sheet& sheet,
-                              std::optional<double> frame) {
+                              std::optional<double> frame, ReportCollector& collector) {
   const M_Matrix4 view = MakeView(*composition.camera);
   const M_Matrix4 projection = MakeProjection(*composition.camera, *composition.size);
   std::vector<Shape> shapes;
@@ -67,6 +67,7 @@ std::vector<Shape> MakeShapes(const Composition& composition, const Sheet& sheet
     const auto frameOf = [](const Time& time) { return static_cast<double>(time.frames.count); };
     const bool isOn = !frame || (frameOf(row.in) <= *frame && *frame < frameOf(row.out));
     if (!isOn || (!layer.placement && !layer.space)) continue;
+    collector.SetLayer(layer.name);
     Shape shape = layer.space ? MakeSolid(layer, view, projection, frame) : MakeFlat(layer);
     shape.name = &layer.name;
     shape.number = i;

@@ -11,6 +11,7 @@
 #include "Composition.h"
 #include "M_Matrix.h"
 #include "M_Rect.h"
+#include "Reports.h"
 #include "Sheet.h"
 
 namespace comp {
@@ -38,7 +39,7 @@ struct Shape {
 /// neighbours in space by their depth. As they are at a frame; without one all, at their first key.
 /// The sheet is the composition's, which has to outlive them.
 std::vector<Shape> MakeShapes(const Composition& composition, const Sheet& sheet,
-                              std::optional<double> frame);
+                              std::optional<double> frame, ReportCollector& collector);
 
 /// A layer under a point.
 struct Hit {

@@ -144,10 +144,9 @@ class Viewer {
     numbers_.clear();
     shapes_.clear();
     if (!composition_ || !composition_->size) return View();
-    collector_.emplace();
-    shapes_ = comp::MakeShapes(*composition_, *sheet_, frame);
-    reports_ = collector_->Reports();
-    collector_.reset();
+    comp::ReportCollector collector;
+    shapes_ = comp::MakeShapes(*composition_, *sheet_, frame, collector);
+    reports_ = collector.Reports();
     const M_FloatRect box = Box();
     for (const comp::Shape& shape : shapes_) {
       std::vector<Point> cut;
@@ -432,7 +431,6 @@ class Viewer {
   std::vector<comp::Timeline> timelines_;
   std::vector<comp::Shape> shapes_;
   std::vector<double> numbers_;  // What the page looks at.
-  std::optional<comp::ReportCollector> collector_;
   std::vector<comp::Report> reports_;
   bool mayDrop_ = false;
 };
