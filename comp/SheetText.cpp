@@ -146,6 +146,26 @@ Json ToJson(const GivenRatio& ratio) {
   return json;
 }
 
+Json ToJson(const Row& row) {
+  return {{"name", row.name},
+          {row.hasSourceRate ? "sourceRate" : "timeBase", ToJson(row.timeBase)},
+          {"stretch", ToJson(row.stretch)},
+          {"inUnits", row.inUnits},
+          {"outUnits", row.outUnits},
+          {"in", ToJson(row.in)},
+          {"out", ToJson(row.out)},
+          {"duration", ToJson(row.duration)},
+          {"clippedIn", ToJson(row.clippedIn)},
+          {"clippedOut", ToJson(row.clippedOut)},
+          {"clippedDuration", ToJson(row.clippedDuration)},
+          {"sourceDuration", ToJson(row.sourceDuration)},
+          {"runningSum", ToJson(row.runningSum)}};
+}
+
+std::string Text(const Json& json) {
+  return json.dump(2, ' ', false, Json::error_handler_t::replace);
+}
+
 }  // namespace
 
 std::string ToTable(const Sheet& sheet, bool mayDrop) {
@@ -192,21 +212,6 @@ std::string ToJson(const Sheet& sheet) {
   Json json = {{"name", sheet.name},           {"frameRate", ToJson(sheet.frameRate)},
                {"start", ToJson(sheet.start)}, {"duration", ToJson(sheet.duration)},
                {"layers", Json::array()},      {"reports", Json::array()}};
-  for (const Row& row : sheet.rows) {
-    json["layers"].push_back({{"name", row.name},
-                              {row.hasSourceRate ? "sourceRate" : "timeBase", ToJson(row.timeBase)},
-                              {"stretch", ToJson(row.stretch)},
-                              {"inUnits", row.inUnits},
-                              {"outUnits", row.outUnits},
-                              {"in", ToJson(row.in)},
-                              {"out", ToJson(row.out)},
-                              {"duration", ToJson(row.duration)},
-                              {"clippedIn", ToJson(row.clippedIn)},
-                              {"clippedOut", ToJson(row.clippedOut)},
-                              {"clippedDuration", ToJson(row.clippedDuration)},
-                              {"sourceDuration", ToJson(row.sourceDuration)},
-                              {"runningSum", ToJson(row.runningSum)}});
-  }
   if (sheet.layout) json["layout"] = ToJson(*sheet.layout);
   if (sheet.scene) json["space"] = ToJson(*sheet.scene);
   for (const Report& report : sheet.reports) {
@@ -215,7 +220,21 @@ std::string ToJson(const Sheet& sheet) {
                                {"severity", report.severity},
                                {"text", report.text}});
   }
-  return json.dump(2, ' ', false, Json::error_handler_t::replace) + '\n';
+  // Layer by layer: one tree of them all would take several times the room.
+  const std::string empty = "\n  \"layers\": []";
+  std::string text = Text(json);
+  const size_t place = text.find(empty) + empty.size() - 1;
+  const std::string rest = text.substr(place);
+  text.resize(place);
+  for (const Row& row : sheet.rows) {
+    text += text.back() == '[' ? "\n    " : ",\n    ";
+    for (const char c : Text(ToJson(row))) {
+      text += c;
+      if (c == '\n') text += "    ";
+    }
+  }
+  text.append(sheet.rows.empty() ? "" : "\n  ").append(rest);
+  return text += '\n';
 }
 
 }  // namespace comp

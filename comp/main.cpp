@@ -12,6 +12,7 @@
 #include <new>
 #include <sstream>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "Composition.h"
@@ -137,6 +138,7 @@ std::string MakeSheets(const Arguments& arguments, comp::Progress* progress) {
     documents.push_back(comp::ToJson(timelines, arguments.mayDrop));
   }
   if (arguments.asCsv) documents.push_back(comp::ToCsv(timelines, arguments.mayDrop));
+  if (documents.size() == 1) return std::move(documents[0]);
   const bool isArray = arguments.asJson && documents.size() > 1;
   std::string text = isArray ? "[\n" : "";
   for (const std::string& document : documents) {
