@@ -24,6 +24,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     const comp::Composition composition = comp::ReadComposition(text, "input");
     const comp::Sheet sheet = comp::MakeSheet(composition);
     comp::ToJson(sheet);
+    comp::ToTable(sheet, true);
     if (composition.size) comp::Draw(composition, {});
   } catch (const comp::InputError&) {
   }

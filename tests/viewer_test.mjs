@@ -20,6 +20,8 @@ tab.on('console', (m) => ['error', 'warning'].includes(m.type()) && complaints.p
 tab.on('pageerror', (e) => complaints.push(e.message));
 tab.on('dialog', (d) => complaints.push(`a dialog: ${d.message()}`));
 await tab.goto(`file://${page}`);
+await tab.waitForFunction(() => document.getElementById('time').textContent);
+console.log(`first picture after ${await tab.evaluate(() => Math.round(performance.now()))} ms`);
 
 const text = (id) => tab.locator(`#${id}`).textContent();
 const painted = () => tab.evaluate(() => new Promise((r) => { requestAnimationFrame(() => requestAnimationFrame(r)); }));
@@ -170,6 +172,32 @@ await tab.keyboard.press('ArrowRight');
 await tab.keyboard.press('ArrowRight');
 await tab.click('#tabLayer');
 assert.deepEqual((await exact('Name')), ['Gulls']);
+
+// Figures to be read, which decide nothing.
+const inSpace = (count) => Array.from({ length: count }, (_, i) => ({
+  name: `${i}`, sourceRate: 24, in: 0, out: 2400, size: [200, 150], position: [i * 97 % 1920, i * 61 % 1080, i * 37 % 1500],
+  keys: [{ frame: 0, angles: [0, i * 7 % 360, 0] }, { frame: 2399, angles: [i * 11 % 360, 90, 20] }] }));
+for (const count of [1000, 10000]) {
+  await open('space.json', composition(`space ${count}`, inSpace(count)).replace('[100,100]', '[1920,1080]').replace(':9,', ':2400,'));
+  console.log(count, 'layers:', await tab.evaluate(async () => {
+    const stage = document.getElementById('stage'), box = stage.getBoundingClientRect();
+    const frames = [], hits = [];
+    document.getElementById('play').click();
+    for (let i = 0, last = performance.now(); i < 60; ++i) {
+      await new Promise((r) => { requestAnimationFrame(r); });
+      frames.push(-last + (last = performance.now()));
+    }
+    document.getElementById('play').click();
+    for (let i = 0; i < 60; ++i) {
+      const event = new PointerEvent('pointermove', { clientX: box.left + 100 + 8 * i, clientY: box.top + 80 + 5 * i });
+      const start = performance.now();
+      stage.dispatchEvent(event);
+      hits.push(performance.now() - start);
+    }
+    const median = (times) => `${times.sort((a, b) => a - b)[30].toFixed(1)} ms`;
+    return `a frame in ${median(frames)}, a hit in ${median(hits)}`;
+  }));
+}
 
 // Reports in other languages.
 await tab.selectOption('#sample', 'sound.json');
