@@ -12,12 +12,16 @@
 #include "JsonPlace.h"
 #include "Language.h"
 #include "Rates.h"
+#include "Text.h"
 #include "Timecode.h"
 
 namespace comp {
 namespace {
 
 using Json = nlohmann::json;
+
+// A value in a sentence.
+std::string Shown(const Json& value) { return Shortened(value.dump(), 40); }
 
 // What is wrong, and where in the tree of the file.
 struct Complaint {
@@ -64,10 +68,10 @@ class Fields {
   int32_t Whole(const char* field) const {
     const Json& value = Get(field);
     if (!value.is_number_integer())
-      ComplainAbout(field, Tr("{0} is not a whole number", {value.dump()}));
+      ComplainAbout(field, Tr("{0} is not a whole number", {Shown(value)}));
     const bool fits = value.is_number_unsigned() ? value.get<uint64_t>() <= INT32_MAX
                                                  : value.get<int64_t>() >= INT32_MIN;
-    if (!fits) ComplainAbout(field, Tr("{0} has more than 32 bits", {value.dump()}));
+    if (!fits) ComplainAbout(field, Tr("{0} has more than 32 bits", {Shown(value)}));
     return value;
   }
 
@@ -77,7 +81,7 @@ class Fields {
     if (!value.is_string()) return Whole(field);
     const auto frame = ParseTimecode(value.get<std::string>(), rate);
     if (!frame || !std::in_range<int32_t>(*frame)) {
-      ComplainAbout(field, Tr("{0} is no timecode of this rate", {value.dump()}));
+      ComplainAbout(field, Tr("{0} is no timecode of this rate", {Shown(value)}));
     }
     return static_cast<int32_t>(*frame);
   }
@@ -140,7 +144,7 @@ class Fields {
       constexpr int32_t kMost = 30000;
       const bool isLength = value.is_number_integer() && value > 0 && value <= kMost;
       if (!isLength)
-        ComplainAbout(field, Tr("{0} is not a whole number from 1 to 30000", {value.dump()}));
+        ComplainAbout(field, Tr("{0} is not a whole number from 1 to 30000", {Shown(value)}));
       return value.get<int32_t>();
     };
     const Json& list = List(field, 2);
@@ -157,7 +161,7 @@ class Fields {
   }
 
   double ToNumber(const char* field, const Json& value) const {
-    if (!value.is_number()) ComplainAbout(field, Tr("{0} is not a number", {value.dump()}));
+    if (!value.is_number()) ComplainAbout(field, Tr("{0} is not a number", {Shown(value)}));
     return value;
   }
 
@@ -320,6 +324,7 @@ class Parser : public nlohmann::detail::json_sax_dom_parser<Json> {
   explicit Parser(Json* json) : Base(*json, false) {}
 
   bool start_object(std::size_t size) {
+    if (++depth_ > kMostDepth) return Complain(Tr("is nested too deeply"));
     keys_.emplace_back();
     if (keys_.size() == 2 && isInList_) {
       ++layer;
@@ -328,10 +333,16 @@ class Parser : public nlohmann::detail::json_sax_dom_parser<Json> {
     return Base::start_object(size);
   }
   bool end_object() {
+    --depth_;
     keys_.pop_back();
     return Base::end_object();
   }
+  bool end_array() {
+    --depth_;
+    return Base::end_array();
+  }
   bool start_array(std::size_t size) {
+    if (++depth_ > kMostDepth) return Complain(Tr("is nested too deeply"));
     if (keys_.size() == 1) isInList_ = field == "layers";
     return Base::start_array(size);
   }
@@ -350,7 +361,7 @@ class Parser : public nlohmann::detail::json_sax_dom_parser<Json> {
   std::string complaint;  // Empty unless something is wrong.
   std::string field;      // The last key.
   size_t layer = 0;       // Its number, or 0 before the first.
-  size_t byte = 0;        // Where the file stopped making sense.
+  size_t byte = 0;        // Where the file stopped making sense, if it did.
 
  private:
   bool Complain(const std::string& what) {
@@ -358,25 +369,23 @@ class Parser : public nlohmann::detail::json_sax_dom_parser<Json> {
     return false;
   }
 
+  static constexpr int kMostDepth = 100;
+
   std::vector<std::set<std::string>> keys_;
+  int depth_ = 0;
   bool isInList_ = false;
 };
 
 // What Parser found, as a sentence.
-[[noreturn]] void Fail(const Parser& parser, const std::string& text, const std::string& fileName) {
+[[noreturn]] void Fail(const Parser& parser, size_t read, const std::string& text,
+                       const std::string& fileName) {
   const size_t layer = parser.layer;
   std::string place = layer == 0 ? Tr("{0}: composition", {fileName})
                                  : Tr("{0}: layer {1}", {fileName, std::to_string(layer)});
   if (!parser.field.empty()) place += Tr(", at or behind field \"{0}\"", {parser.field});
-  size_t byte = parser.byte;
-  std::string where;
-  if (byte > 0) {
-    const auto [line, column] = PlaceOf(text, byte);
-    where = Tr(" (line {0}, column {1})", {std::to_string(line), std::to_string(column)});
-  } else if (layer > 0) {
-    byte = FindPath(text, {"layers", std::to_string(layer - 1), parser.field});
-  }
-  const auto [line, column] = PlaceOf(text, byte);
+  const auto [line, column] = PlaceOf(text, parser.byte > 0 ? parser.byte : read - 1);
+  const std::string where =
+      Tr(" (line {0}, column {1})", {std::to_string(line), std::to_string(column)});
   throw InputError(Tr("{0}: {1}{2}.", {place, parser.complaint, where}), line, column);
 }
 
@@ -409,8 +418,9 @@ Composition Read(const Json& json, const std::string& fileName) {
 Composition ReadComposition(const std::string& text, const std::string& fileName) {
   Json json;
   Parser parser(&json);
-  Json::sax_parse(text, &parser);
-  if (!parser.complaint.empty()) Fail(parser, text, fileName);
+  const char *const begin = text.data(), *read = begin;
+  Json::sax_parse(Reading(begin, &read), Reading(begin + text.size(), &read), &parser);
+  if (!parser.complaint.empty()) Fail(parser, static_cast<size_t>(read - begin), text, fileName);
   try {
     return Read(json, fileName);
   } catch (const Complaint& complaint) {

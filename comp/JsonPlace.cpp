@@ -1,7 +1,6 @@
 #include "JsonPlace.h"
 
 #include <algorithm>
-#include <iterator>
 #include <nlohmann/json.hpp>
 #include <string_view>
 
@@ -9,29 +8,6 @@ namespace comp {
 namespace {
 
 using Json = nlohmann::json;
-
-// Characters for the parser, which does not tell how far it is: this does.
-class Reading {
- public:
-  using iterator_category = std::input_iterator_tag;
-  using value_type = char;
-  using difference_type = std::ptrdiff_t;
-  using pointer = const char*;
-  using reference = const char&;
-
-  Reading(const char* at, const char** read) : at_(at), read_(read) {}
-  reference operator*() const { return *at_; }
-  Reading& operator++() {
-    *read_ = ++at_;
-    return *this;
-  }
-  bool operator==(const Reading& other) const { return at_ == other.at_; }
-  bool operator!=(const Reading& other) const { return at_ != other.at_; }
-
- private:
-  const char* at_;
-  const char** read_;
-};
 
 // Follows the parser along the path.
 class Finder : public nlohmann::json_sax<Json> {
@@ -117,7 +93,9 @@ class Finder : public nlohmann::json_sax<Json> {
 Place PlaceOf(const std::string& text, size_t byte) {
   const std::string_view before = std::string_view(text).substr(0, byte);
   const auto lines = static_cast<size_t>(std::count(before.begin(), before.end(), '\n'));
-  return {lines + 1, before.size() - (lines == 0 ? 0 : before.rfind('\n') + 1) + 1};
+  const std::string_view line = before.substr(lines == 0 ? 0 : before.rfind('\n') + 1);
+  const auto isFirst = [](char c) { return (static_cast<unsigned char>(c) & 0xC0) != 0x80; };
+  return {lines + 1, static_cast<size_t>(std::count_if(line.begin(), line.end(), isFirst)) + 1};
 }
 
 size_t FindPath(const std::string& text, const std::vector<std::string>& path) {

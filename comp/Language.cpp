@@ -17,7 +17,9 @@ bool BindCatalogues() {
   const auto program = std::filesystem::canonical("/proc/self/exe", error);
   // A page is no file, and has its catalogues at the root.
   const auto folder = error ? "/share/locale" : program.parent_path() / COMP_RELATIVE_LOCALE_FOLDER;
-  return bindtextdomain(kDomain, folder.c_str()) && bind_textdomain_codeset(kDomain, "UTF-8");
+  // C libraries that know no other codeset have null for this.
+  bind_textdomain_codeset(kDomain, "UTF-8");
+  return bindtextdomain(kDomain, folder.c_str()) != nullptr;
 }
 
 }  // namespace

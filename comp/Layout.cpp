@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <numeric>
+#include <set>
+#include <utility>
 
 namespace comp {
 namespace {
@@ -26,22 +28,31 @@ PlacedLayer Place(const Layer& layer, const Size& frame) {
   return placed;
 }
 
-// By a sweep from left to right, so that only neighbours are compared.
+// By a sweep from left to right, with those that are open by their top: few others are compared.
 void FindOverlaps(std::vector<PlacedLayer>* layers) {
-  std::vector<size_t> order(layers->size()), open;
+  std::vector<size_t> order(layers->size());
   std::iota(order.begin(), order.end(), 0);
   const auto bounds = [&](size_t i) -> const M_LRect& { return (*layers)[i].bounds; };
   std::stable_sort(order.begin(), order.end(),
                    [&](size_t i, size_t j) { return bounds(i).left < bounds(j).left; });
+  std::set<std::pair<int64_t, size_t>> byTop, byRight;
+  int64_t tallest = 0;
   std::vector<std::vector<size_t>> below(layers->size());
   for (const size_t i : order) {
-    std::erase_if(open, [&](size_t other) { return bounds(other).right <= bounds(i).left; });
-    for (const size_t other : open) {
-      if (M_LRectCompare(7, &bounds(i), &bounds(other))) {
-        below[std::min(i, other)].push_back(std::max(i, other));
-      }
+    const M_LRect& own = bounds(i);
+    while (!byRight.empty() && byRight.begin()->first <= own.left) {
+      const size_t gone = byRight.begin()->second;
+      byRight.erase(byRight.begin());
+      byTop.erase({bounds(gone).top, gone});
     }
-    open.push_back(i);
+    const auto end = byTop.lower_bound({own.bottom, 0});
+    for (auto other = byTop.lower_bound({own.top - tallest, 0}); other != end; ++other) {
+      const size_t j = other->second;
+      if (M_LRectCompare(7, &own, &bounds(j))) below[std::min(i, j)].push_back(std::max(i, j));
+    }
+    byTop.insert({own.top, i});
+    byRight.insert({own.right, i});
+    tallest = std::max(tallest, int64_t{own.bottom} - own.top);
   }
   for (size_t i = 0; i < layers->size(); ++i) {
     std::sort(below[i].begin(), below[i].end());

@@ -10,9 +10,12 @@
 #include <utility>
 
 #include "Composition.h"
+#include "Fraction.h"
+#include "JsonPlace.h"
 #include "Language.h"
 #include "M_Ops.h"
 #include "Rates.h"
+#include "Seconds.h"
 
 namespace comp {
 namespace {
@@ -20,7 +23,7 @@ namespace {
 using Json = nlohmann::json;
 
 // Writers put Infinity, NaN and numbers beyond a double into their metadata, which JSON has not:
-// they become null. The rest stays, byte by byte. A file that is nested deeper than any edit
+// they become empty texts. The rest stays where it is. A file that is nested deeper than any edit
 // throws.
 std::string WithoutOddNumbers(const std::string& text, const std::string& fileName) {
   int depth = 0;
@@ -40,10 +43,10 @@ std::string WithoutOddNumbers(const std::string& text, const std::string& fileNa
       };
       while (end < text.size() && isPart(text[end])) ++end;
       const std::string token = text.substr(i, end - i);
-      const bool isName = token.find_first_of("IN") != std::string::npos;
-      const bool isTooLarge = !isName && token.size() > 3 && token != "true" && token != "false" &&
-                              token != "null" && std::isinf(std::strtod(token.c_str(), nullptr));
-      plain += isName || isTooLarge ? "null" : token;
+      // Also what strtod() takes for one of them.
+      char* rest;
+      const bool isOdd = !std::isfinite(std::strtod(token.c_str(), &rest)) && *rest == '\0';
+      plain += isOdd ? std::string("\"\"").append(token.size() - 2, ' ') : token;
     } else {
       depth += c == '{' || c == '[' ? 1 : c == '}' || c == ']' ? -1 : 0;
       if (depth > 1000) throw InputError(Tr("{0}: is nested too deeply.", {fileName}));
@@ -64,21 +67,27 @@ class Reader {
   explicit Reader(const std::string& fileName) : fileName_(fileName) {}
 
   std::vector<Timeline> Read(const Json& root) {
-    std::vector<Timeline> timelines;
-    if (IsA(root, "SerializableCollection")) {
-      for (const Json& child : List(root, "children")) {
-        if (IsA(child, "Timeline")) timelines.push_back(ReadTimeline(child));
-      }
-    } else if (IsA(root, "Timeline")) {
-      timelines.push_back(ReadTimeline(root));
-    } else if (IsA(root, "Stack") || IsItem(root) || IsA(root, "Track")) {
-      timelines.push_back(ReadTracks(root, root));
-    }
-    if (timelines.empty()) throw InputError(Tr("{0}: there is no timeline in it.", {fileName_}));
-    return timelines;
+    std::vector<std::string> passedOver;
+    Collect(root, &passedOver);
+    if (timelines_.empty()) throw InputError(Tr("{0}: there is no timeline in it.", {fileName_}));
+    auto& remarks = timelines_[0].remarks;
+    remarks.insert(remarks.end(), passedOver.begin(), passedOver.end());
+    return std::move(timelines_);
   }
 
  private:
+  void Collect(const Json& json, std::vector<std::string>* passedOver) {
+    if (IsA(json, "SerializableCollection")) {
+      for (const Json& child : List(json, "children")) Collect(child, passedOver);
+    } else if (IsA(json, "Timeline")) {
+      timelines_.push_back(ReadTracks(json, Get(json, "tracks")));
+    } else if (IsA(json, "Stack") || IsItem(json) || IsTrack(json)) {
+      timelines_.push_back(ReadTracks(json, json));
+    } else {
+      passedOver->push_back(Tr("an object {0} is passed over", {Get(json, "OTIO_SCHEMA").dump()}));
+    }
+  }
+
   // Whether an object's schema has this name, in any version.
   static bool IsA(const Json& json, const std::string& name) {
     if (!json.is_object() || !json.contains("OTIO_SCHEMA")) return false;
@@ -111,37 +120,39 @@ class Reader {
     if (remarks_.insert(text).second) timeline_.remarks.push_back(text);
   }
 
-  std::optional<M_Ratio> Rate(const Json& time) {
+  // What it is, and what stands for it.
+  struct RateOfTime {
+    Fraction exact;
+    M_Ratio ratio;
+  };
+
+  std::optional<RateOfTime> Rate(const Json& time) {
     const Json& rate = Get(time, "rate");
-    if (!rate.is_number()) return {};
-    const auto ratio = ToRatio(rate.dump(), true);
+    const auto exact = ToFraction(rate.is_number() ? rate.dump() : "", true);
     // Neither may be more than a num holds: a frame is its reciprocal.
-    if (!ratio || ratio->ratio.num <= 0 || ratio->ratio.den > INT32_MAX) return {};
-    if (!ratio->isExact)
+    const auto ratio = exact ? Nearest(*exact, INT32_MAX) : std::nullopt;
+    if (!ratio || ratio->num <= 0) return {};
+    if (!Seconds(*exact).isExact)
       Remark(Tr("the rate {0} is no ratio of 32 bits: the nearest is taken", {rate.dump()}));
-    timeline_.rates.insert(ratio->ratio);
-    return ratio->ratio;
+    timeline_.rates.insert(*ratio);
+    return RateOfTime{*exact, *ratio};
   }
 
-  // value / rate.
+  // value / rate; nothing where there is none, and unknown for one that cannot be read.
   std::optional<Seconds> Time(const Json& time) {
+    if (time.is_null()) return {};
     const Json& value = Get(time, "value");
     const auto rate = Rate(time);
-    if (!value.is_number() || !rate) return {};
-    const auto count = ToRatio(value.dump(), false);
-    if (!count) {
-      Remark(Tr("the time {0} does not fit", {value.dump()}));
-      return Seconds{{0, 0}, false};
-    }
-    const M_Ratio frame = {static_cast<int32_t>(rate->den), static_cast<uint32_t>(rate->num)};
-    return Seconds{count->ratio, count->isExact, count->error} * Seconds{frame};
+    const auto count = ToFraction(value.is_number() ? value.dump() : "", false);
+    if (rate && count) return Seconds(*count) / Seconds(rate->exact);
+    Remark(Tr("the time {0} over {1} cannot be read", {value.dump(), Get(time, "rate").dump()}));
+    return kUnknown;
   }
 
   std::optional<Range> ReadRange(const Json& range) {
     const auto duration = Time(Get(range, "duration"));
     if (!duration) return {};
-    const auto start = Time(Get(range, "start_time"));
-    return Range{start.value_or(Seconds()), *duration};
+    return Range{Time(Get(range, "start_time")).value_or(Seconds()), *duration};
   }
 
   // The medium that a clip shows: the one that is chosen, of several.
@@ -204,20 +215,16 @@ class Reader {
 
   // Seconds of the source a second.
   Seconds Speed(const Json& item) {
-    Seconds speed = {{1, 1}};
+    Seconds speed = M_Ratio{1, 1};
     for (const Json& effect : List(item, "effects")) {
       if (IsA(effect, "FreezeFrame")) {
-        speed = {{0, 1}};
+        speed = M_Ratio{0, 1};
       } else if (IsA(effect, "LinearTimeWarp")) {
         const Json& scalar = Get(effect, "time_scalar");
-        const auto factor = ToRatio(scalar.is_number() ? scalar.dump() : "", false);
-        const Seconds product = factor
-                                    ? speed * Seconds{factor->ratio, factor->isExact, factor->error}
-                                    : Seconds{{0, 0}};
-        if (!factor || !product.isExact) {
-          Remark(Tr("the speed of \"{0}\" is not exact", {Name(item)}));
-        }
-        if (product.IsKnown()) speed = product;
+        if (scalar.is_null()) continue;
+        const auto factor = ToFraction(scalar.is_number() ? scalar.dump() : "", false);
+        speed = speed * (factor ? Seconds(*factor) : kUnknown);
+        if (!speed.isExact) Remark(Tr("the speed of \"{0}\" is not exact", {Name(item)}));
       } else if (!IsA(effect, "Effect") && !Get(effect, "OTIO_SCHEMA").is_null()) {
         Remark(Tr("an effect {0} is passed over", {Get(effect, "OTIO_SCHEMA").dump()}));
       }
@@ -225,41 +232,55 @@ class Reader {
     return speed;
   }
 
+  // Leaves of items and markers what is in a range, and counts from its beginning.
+  static void Trim(Track* track, const Range& range) {
+    const auto items = std::exchange(track->items, {});
+    for (Item item : items) {
+      item.recordIn = item.recordIn - range.start;
+      item.recordOut = item.recordOut - range.start;
+      const Seconds before = Seconds() - item.recordIn, behind = item.recordOut - range.duration;
+      if (!(Seconds() < item.recordOut) || !(item.recordIn < range.duration)) continue;
+      if (Seconds() < before) {
+        item.recordIn = Seconds();
+        item.sourceIn = item.sourceIn + before * item.speed;
+      }
+      if (Seconds() < behind) {
+        item.recordOut = range.duration;
+        item.sourceOut = item.sourceOut - behind * item.speed;
+      }
+      track->items.push_back(std::move(item));
+    }
+    Trim(&track->markers, range);
+    track->duration = range.duration;
+  }
+  static void Trim(std::vector<Marker>* markers, const Range& range) {
+    for (Marker& marker : *markers) {
+      marker.in = marker.in - range.start;
+      marker.out = marker.out - range.start;
+    }
+    std::erase_if(*markers, [&](const Marker& marker) {
+      return marker.in < Seconds() || !(marker.in < range.duration);
+    });
+  }
+
   Track ReadTrack(const Json& json) {
     Track track;
     track.name = Name(json);
     const Json& kind = Get(json, "kind");
     track.kind = kind.is_string() ? kind.get<std::string>() : "Video";
-    const auto trim = ReadRange(Get(json, "source_range"));
-    Seconds at = Seconds() - (trim ? trim->start : Seconds());
-    // Of a trimmed track, what is in the trim.
-    const auto add = [&](Item item) {
-      if (trim) {
-        const Seconds before = Seconds() - item.recordIn, behind = item.recordOut - trim->duration;
-        if (!(Seconds() < item.recordOut) || !(item.recordIn < trim->duration)) return;
-        if (Seconds() < before) {
-          item.recordIn = Seconds();
-          item.sourceIn = item.sourceIn + before * Seconds{item.speed};
-        }
-        if (Seconds() < behind) {
-          item.recordOut = trim->duration;
-          item.sourceOut = item.sourceOut - behind * Seconds{item.speed};
-        }
-      }
-      track.items.push_back(std::move(item));
-    };
+    Seconds at;
     for (const Json& child : List(json, "children")) {
       if (IsA(child, "Transition")) {
         const Seconds in = Time(Get(child, "in_offset")).value_or(Seconds());
         const Seconds out = Time(Get(child, "out_offset")).value_or(Seconds());
-        add({Item::Kind::kTransition,
-             Name(child),
-             at - in,
-             at + out,
-             Seconds() - in,
-             out,
-             {1, 1},
-             {}});
+        track.items.push_back({Item::Kind::kTransition,
+                               Name(child),
+                               at - in,
+                               at + out,
+                               Seconds() - in,
+                               out,
+                               M_Ratio{1, 1},
+                               {}});
         continue;
       }
       const bool isNested = IsA(child, "Stack") || IsTrack(child) || IsA(child, "Timeline");
@@ -273,42 +294,33 @@ class Reader {
                                   : IsA(child, "Clip") ? Item::Kind::kClip
                                                        : Item::Kind::kGap;
       const Seconds end = at + range.duration, sourceEnd = range.start + range.duration * speed;
-      add({itemKind, Name(child), at, end, range.start, sourceEnd, speed.ratio,
-           PictureSize(child)});
+      track.items.push_back(
+          {itemKind, Name(child), at, end, range.start, sourceEnd, speed, PictureSize(child)});
       ReadMarkers(child, range, at, &track.markers);
       at = end;
     }
-    track.duration = trim ? trim->duration : at;
-    std::erase_if(track.markers, [&](const Marker& marker) {
-      return marker.in < Seconds() || !(marker.in < track.duration);
-    });
+    track.duration = at;
+    const auto trim = ReadRange(Get(json, "source_range"));
+    if (trim) Trim(&track, *trim);
     ReadMarkers(json, {trim ? trim->start : Seconds(), track.duration}, Seconds(), &track.markers);
     return track;
   }
 
   // The first rate that is met.
   std::optional<M_Ratio> FindRate(const Json& json) {
-    if (IsA(json, "RationalTime")) return Rate(json);
-    if (json.is_object()) {
-      for (const char* field : {"source_range", "available_range", "start_time", "duration",
-                                "media_reference", "media_references", "tracks", "children"}) {
-        if (const auto rate = FindRate(Get(json, field))) return rate;
-      }
-      if (!json.contains("OTIO_SCHEMA")) {
-        for (const Json& value : json) {
-          if (const auto rate = FindRate(value)) return rate;
-        }
-      }
+    if (!json.is_object()) return {};
+    if (IsA(json, "RationalTime")) {
+      const auto rate = Rate(json);
+      return rate ? std::optional(rate->ratio) : std::nullopt;
     }
-    if (json.is_array()) {
-      for (const Json& child : json) {
-        if (const auto rate = FindRate(child)) return rate;
-      }
+    for (const char* field : {"source_range", "start_time", "duration", "tracks"}) {
+      if (const auto rate = FindRate(Get(json, field))) return rate;
     }
-    return {};
+    for (const Json& child : List(json, "children")) {
+      if (const auto rate = FindRate(child)) return rate;
+    }
+    return IsA(json, "Clip") ? FindRate(Get(Medium(json), "available_range")) : std::nullopt;
   }
-
-  Timeline ReadTimeline(const Json& json) { return ReadTracks(json, Get(json, "tracks")); }
 
   Timeline ReadTracks(const Json& json, const Json& tracks) {
     timeline_ = {};
@@ -317,7 +329,7 @@ class Reader {
     const Json& start = Get(json, "global_start_time");
     timeline_.start = Time(start).value_or(Seconds());
     const auto rate = Rate(start);
-    const auto met = rate ? rate : FindRate(tracks);
+    const auto met = rate ? std::optional(rate->ratio) : FindRate(tracks);
     timeline_.rate = met.value_or(M_Ratio{24, 1});
     if (!met) Remark(Tr("no rate is given: 24 frames a second are taken"));
     const auto add = [&](const Json& child) {
@@ -339,11 +351,21 @@ class Reader {
         }
       }
     }
+    const auto trim = IsA(tracks, "Stack") ? ReadRange(Get(tracks, "source_range")) : std::nullopt;
+    if (trim) {
+      for (Track& track : timeline_.tracks) Trim(&track, *trim);
+      timeline_.duration = trim->duration;
+    }
+    if (IsA(tracks, "Stack")) {
+      ReadMarkers(tracks, {trim ? trim->start : Seconds(), timeline_.duration}, Seconds(),
+                  &timeline_.markers);
+    }
     return std::move(timeline_);
   }
 
   const std::string& fileName_;
-  Timeline timeline_;
+  std::vector<Timeline> timelines_;
+  Timeline timeline_;              // The one that is read.
   std::set<std::string> remarks_;  // Those of the timeline, each once.
 };
 
@@ -352,9 +374,15 @@ class Reader {
 bool IsOtio(const std::string& text) { return text.find("\"OTIO_SCHEMA\"") != std::string::npos; }
 
 std::vector<Timeline> ReadOtio(const std::string& text, const std::string& fileName) {
-  const Json root = Json::parse(WithoutOddNumbers(text, fileName), nullptr, false);
-  if (root.is_discarded()) throw InputError(Tr("{0}: is not JSON, or ends too soon.", {fileName}));
-  return Reader(fileName).Read(root);
+  const std::string plain = WithoutOddNumbers(text, fileName);
+  try {
+    return Reader(fileName).Read(Json::parse(plain));
+  } catch (const Json::parse_error& error) {
+    const auto [line, column] = PlaceOf(text, error.byte - std::min<size_t>(error.byte, 1));
+    const std::string where =
+        Tr(" (line {0}, column {1})", {std::to_string(line), std::to_string(column)});
+    throw InputError(Tr("{0}: is not JSON, or ends too soon{1}.", {fileName, where}), line, column);
+  }
 }
 
 }  // namespace comp

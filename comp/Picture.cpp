@@ -64,10 +64,8 @@ std::string DrawShape(const Shape& shape, const M_FloatRect& box) {
         "fill=\"" + color + "\" fill-opacity=\"0.6\" stroke=\"" + color + "\" stroke-width=\"2\"",
         Title(*shape.name));
   }
-  std::vector<Point> line;
-  for (const Point& p : shape.outline) {
-    line.push_back({std::clamp(p.x, box.left, box.right), std::clamp(p.y, box.top, box.bottom)});
-  }
+  const std::vector<Point> line = ClippedLine(shape.outline, box);
+  if (line.empty()) return "";
   return "<polyline points=\"" + PointList(line) + "\" fill=\"none\" stroke=\"" + color +
          "\" stroke-width=\"3\">" + Title(*shape.name) + "</polyline>\n";
 }
@@ -76,12 +74,11 @@ std::string DrawShape(const Shape& shape, const M_FloatRect& box) {
 // room; else shortened; else not at all.
 class Labels {
  public:
-  Labels(double size, const Size& frame)
-      : size_(size), most_(static_cast<size_t>(frame.width / (size * kColumn))) {}
+  Labels(double size, const Size& frame) : size_(size), most_(frame.width / size) {}
 
   std::string Place(const std::string& name, const Point& middle) {
-    constexpr size_t kFew = 10;
-    for (const std::string& text : {Shortened(name, most_), Shortened(name, kFew)}) {
+    constexpr double kFew = 7;
+    for (const std::string& text : {Fitted(name, most_), Fitted(name, kFew)}) {
       for (const int step : {0, 1, -1, 2, -2, 3, -3}) {
         const Point at = {middle.x, middle.y + step * size_ * 1.2};
         if (!Take(text, at)) continue;
@@ -93,10 +90,8 @@ class Labels {
   }
 
  private:
-  static constexpr double kColumn = 0.6;  // The width of a letter by its height, about.
-
   bool Take(const std::string& text, const Point& middle) {
-    const double half = kColumn / 2 * size_ * static_cast<double>(Columns(text));
+    const double half = size_ * Width(text) / 2;
     const M_FloatRect box = {middle.x - half, middle.y - size_, middle.x + half,
                              middle.y + 0.3 * size_};
     const auto overlaps = [&](const M_FloatRect& other) {
@@ -108,7 +103,7 @@ class Labels {
   }
 
   double size_;
-  size_t most_;
+  double most_;  // By the height of letters.
   std::vector<M_FloatRect> placed_;
 };
 
@@ -124,33 +119,33 @@ std::string DrawInFrame(const Shape& shape, const Size& frame, Labels* labels) {
          labels->Place(*shape.name, {sum.x / count, sum.y / count});
 }
 
-std::string Head(const Size& frame, int margin, int letters) {
+std::string Head(const Size& frame, double margin, double letters) {
   char head[200];
   std::snprintf(head, sizeof head,
-                "<svg xmlns=\"http://www.w3.org/2000/svg\" viewBox=\"%d %d %d %d\" "
-                "font-family=\"sans-serif\" font-size=\"%d\" text-anchor=\"middle\">\n",
+                "<svg xmlns=\"http://www.w3.org/2000/svg\" viewBox=\"%g %g %g %g\" "
+                "font-family=\"sans-serif\" font-size=\"%.3g\" text-anchor=\"middle\">\n",
                 -margin, -margin, frame.width + 2 * margin, frame.height + 2 * margin, letters);
   return head;
 }
 
 // The name above the frame, and below what the lines are.
-std::string Legend(const Composition& composition, int margin, int letters) {
+std::string Legend(const Composition& composition, double margin, double letters) {
   const Size& frame = *composition.size;
-  const double room = (frame.width + 1.9 * margin) / (0.6 * letters);
+  const double room = (frame.width + 1.9 * margin) / letters;
   std::string svg = "<g text-anchor=\"start\">\n<text x=\"" + ToText(-0.95 * margin) + "\" y=\"" +
                     ToText(-margin + 1.5 * letters) + "\">" +
-                    Escaped(Shortened(composition.name, static_cast<size_t>(room))) + "</text>\n";
+                    Escaped(Fitted(composition.name, room)) + "</text>\n";
   double x = -0.95 * margin;
   const double y = frame.height + margin - 0.7 * letters;
   for (const auto& [style, name] :
        {std::pair{"part", Tr("what is in the frame")}, {"hull", Tr("the hull of all")}}) {
     char line[160];
-    std::snprintf(line, sizeof line, "<path class=\"%s\" d=\"M%.0f %.0fh%d\"/>\n", style, x,
+    std::snprintf(line, sizeof line, "<path class=\"%s\" d=\"M%.2f %.2fh%.2f\"/>\n", style, x,
                   y - 0.3 * letters, 2 * letters);
     svg += line;
     svg += "<text x=\"" + ToText(x + 2.5 * letters) + "\" y=\"" + ToText(y) + "\">" + name +
            "</text>\n";
-    x += (4 + 0.6 * static_cast<double>(Columns(name))) * letters;
+    x += (4 + Width(name)) * letters;
   }
   return svg + "</g>\n";
 }
@@ -158,9 +153,8 @@ std::string Legend(const Composition& composition, int margin, int letters) {
 // Veils what is outside the frame.
 std::string DrawVeil(const M_FloatRect& box, const Size& frame) {
   char text[200];
-  std::snprintf(text, sizeof text,
-                "<path class=\"veil\" d=\"M%.0f %.0fH%.0fV%.0fH%.0fzM0 0V%dH%dV0z\"/>\n", box.left,
-                box.top, box.right, box.bottom, box.left, frame.height, frame.width);
+  std::snprintf(text, sizeof text, "<path class=\"veil\" d=\"M%g %gH%gV%gH%gzM0 0V%dH%dV0z\"/>\n",
+                box.left, box.top, box.right, box.bottom, box.left, frame.height, frame.width);
   return text;
 }
 
@@ -172,10 +166,9 @@ Picture Draw(const Composition& composition, const PictureOptions& options) {
   // What is reported here is in the sheet's reports.
   ReportCollector collector;
   const std::vector<Shape> shapes = MakeShapes(composition, sheet, options.frame, collector);
-  const int margin = std::max(frame.width, frame.height) / 4;
-  const int letters = (frame.width + 2 * margin) / 72 + 1;
-  const M_FloatRect box = {-1.0 * margin, -1.0 * margin, frame.width + 1.0 * margin,
-                           frame.height + 1.0 * margin};
+  const double margin = std::max(frame.width, frame.height) / 4.0;
+  const double letters = (frame.width + 2 * margin) / 72;
+  const M_FloatRect box = {-margin, -margin, frame.width + margin, frame.height + margin};
   Picture picture = {
       Head(frame, margin, letters) + Title(composition.name) + kStyle, {}, sheet.reports};
   char text[200];
@@ -194,6 +187,7 @@ Picture Draw(const Composition& composition, const PictureOptions& options) {
   for (auto shape = shapes.rbegin(); shape != shapes.rend(); ++shape) {
     picture.svg += DrawInFrame(*shape, frame, &labels);
   }
+  std::erase_if(all, [](const Point& p) { return !std::isfinite(p.x) || !std::isfinite(p.y); });
   M_ComputeConvexHull(all.cbegin(), all.cend(), all);
   picture.svg += Polygon(Clipped(all, box), "class=\"hull\"", Title(Tr("the hull of all")));
   picture.svg += Legend(composition, margin, letters);
@@ -213,7 +207,9 @@ Picture Draw(const Composition& composition, const PictureOptions& options) {
     }
   }
   if (options.point) {
-    picture.svg += Dot(*options.point, 6, "fill=\"none\" stroke=\"#d00\" stroke-width=\"3\"");
+    const Point shown = {std::clamp(options.point->x, box.left, box.right),
+                         std::clamp(options.point->y, box.top, box.bottom)};
+    picture.svg += Dot(shown, 6, "fill=\"none\" stroke=\"#d00\" stroke-width=\"3\"");
     picture.hits = HitsAt(shapes, *options.point, options.tolerance);
   }
   picture.svg += "</svg>\n";

@@ -13,42 +13,25 @@
 namespace comp {
 namespace {
 
-// 23.976 and its like: as many digits as are written agree with n x 1000/1001.
-std::optional<M_Ratio> ToBroadcastRate(std::string_view decimal, double value) {
+// 23.976 and its like: n thousands over 1001, as far as it is written, rounded or cut off.
+std::optional<Fraction> ToBroadcastRate(std::string_view decimal, double value) {
   const int32_t nominal = M_RoundDouble(value * 1.001);
-  if (nominal % 6 != 0 || nominal <= 0 || nominal > 960) return {};
-  const M_Ratio rate = {nominal * 1000, 1001};
   const size_t point = decimal.find('.');
   const size_t digits = point == std::string_view::npos ? 0 : decimal.size() - point - 1;
-  // Half a unit of the last digit, and some more: 23.98 is off by 0.004, 23.976 by 0.00002.
-  const double most =
-      digits < 2 ? 0 : std::max(0.6 * std::pow(10, -static_cast<double>(digits)), 1e-9);
-  if (std::abs(rate.num / 1001.0 - value) > most) return {};
-  return rate;
-}
-
-// Without its exponent, for one that is small.
-std::string Plain(std::string_view decimal) {
-  const size_t e = decimal.find_first_of("eE");
-  if (e == std::string_view::npos) return std::string(decimal);
-  int exponent = 0;
-  const char* const from =
-      decimal.data() + e + 1 + (decimal.substr(e + 1).starts_with('+') ? 1 : 0);
-  std::from_chars(from, decimal.data() + decimal.size(), exponent);
-  std::string digits(decimal.substr(0, e));
-  if (std::abs(exponent) > 18) return {};
-  size_t point = digits.find('.');
-  if (point == std::string::npos)
-    point = digits.size();
-  else
-    digits.erase(point, 1);
-  const size_t sign = digits.starts_with('-') ? 1 : 0;
-  auto place = static_cast<std::ptrdiff_t>(point) + exponent;
-  while (place <= static_cast<std::ptrdiff_t>(sign)) digits.insert(sign, 1, '0'), ++place;
-  while (place > static_cast<std::ptrdiff_t>(digits.size())) digits.push_back('0');
-  if (place < static_cast<std::ptrdiff_t>(digits.size()))
-    digits.insert(static_cast<size_t>(place), 1, '.');
-  return digits;
+  // Two digits are enough only where everybody writes two.
+  const bool isUsual = nominal % 6 == 0 && digits == 2;
+  const bool isNominal = nominal > 0 && nominal <= 960 && (nominal % 6 == 0 || nominal == 15);
+  if (!isNominal || !(digits > 2 || isUsual)) return {};
+  const double rate = nominal * 1000 / 1001.0;
+  const double unit = std::max(std::pow(10, -static_cast<double>(digits)), 1e-9);
+  const double off = (value - rate) / unit;
+  const bool isCutOff = digits > 2 && off > -1 && off <= 0;
+  bool isFloat = false;
+  for (const double number : {rate, std::round(rate * 1000) / 1000, std::round(rate * 100) / 100}) {
+    isFloat |= static_cast<double>(static_cast<float>(number)) == value;
+  }
+  if (!isCutOff && !isFloat && !(std::abs(off) <= 0.51)) return {};
+  return Fraction(Wide{nominal} * 1000, 1001);
 }
 
 // The small ratio whose double this is, such as 47/55: ratios so small lie so far apart that no
@@ -96,20 +79,26 @@ std::optional<double> ToDouble(std::string_view decimal) {
 #endif
 }
 
-std::optional<Decimal> ToRatio(std::string_view decimal, bool isRate) {
-  const auto read = ToDouble(decimal);
-  if (!read || !std::isfinite(*read)) return {};
-  const double value = *read;
+std::optional<Fraction> ToFraction(std::string_view decimal, bool isRate) {
+  const auto value = ToDouble(decimal);
+  if (!value || !std::isfinite(*value)) return {};
   if (isRate) {
-    if (const auto rate = ToBroadcastRate(decimal, value)) return Decimal{*rate, true};
+    if (const auto rate = ToBroadcastRate(decimal, *value)) return rate;
   }
-  if (const auto exact = M_ParseRatio(Plain(decimal))) return Decimal{*exact, true};
-  if (const auto small = ToSmallRatio(value)) return Decimal{*small, true};
-  M_Ratio nearest;
-  unsigned char isOutOfRange;
-  M_FpLong2Ratio(&nearest, &isOutOfRange, value);
-  if (isOutOfRange) return {};
-  return Decimal{nearest, false, std::abs(value - nearest.num / static_cast<double>(nearest.den))};
+  // What has been a double shows by its many digits.
+  constexpr size_t kFew = 14;
+  if (decimal.size() > kFew) {
+    if (const auto small = ToSmallRatio(*value)) return Fraction(*small);
+  }
+  return ParseDecimal(decimal);
+}
+
+std::optional<Decimal> ToRatio(std::string_view decimal, bool isRate) {
+  const auto number = ToFraction(decimal, isRate);
+  const auto ratio = number ? Nearest(*number) : std::nullopt;
+  if (!ratio) return {};
+  const Fraction read(*ratio);
+  return Decimal{*ratio, read.num == number->num && read.den == number->den};
 }
 
 }  // namespace comp

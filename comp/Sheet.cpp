@@ -4,50 +4,68 @@
 #include <numeric>
 
 #include "M_Ops.h"
-#include "Timeline.h"
+#include "Seconds.h"
+#include "Timecode.h"
 
 namespace comp {
 namespace {
 
-constexpr Value kOverflown = {{0, 0}, Accuracy::kOverflow};
+// A value as the sheet shows it, and what it is calculated with.
+struct Term {
+  Value shown;
+  Seconds exact;
+};
 
-Accuracy Worse(Accuracy a, Accuracy b) { return a < b ? b : a; }
+struct Operation {
+  decltype(M_AddRatio)* library;
+  Seconds (*exactly)(const Seconds&, const Seconds&);
+};
 
-// Exactly, or with a report; then approximately. What goes in approximated comes out so.
-Value Calculate(Operation operation, const Value& a, const Value& b) {
-  const Accuracy given = Worse(a.accuracy, b.accuracy);
-  if (given == Accuracy::kOverflow) return kOverflown;
-  Value result = {{}, given};
-  if (operation(&a.ratio, &b.ratio, &result.ratio, nullptr) != 0) {
-    unsigned char status = 2;
-    if (operation(&a.ratio, &b.ratio, &result.ratio, &status) != 0 || status != 2) {
-      return kOverflown;
-    }
-    result.accuracy = Accuracy::kApproximated;
+constexpr Operation kAdd = {
+    M_AddRatio, operator+ },
+    kSub = {M_SubRatio, operator- },
+            kMul = {M_MulRatio, operator* }, kDiv = {M_DivRatio, operator/ };
+
+Term ToTerm(const M_Ratio& ratio) { return {{ratio, Accuracy::kExact}, ratio}; }
+
+// As the library gives it; where that sees an overflow, in lowest terms, if that is enough; else
+// the nearest, and the library reports it.
+Term Calculate(const Operation& operation, const Term& a, const Term& b) {
+  const Seconds exact = operation.exactly(a.exact, b.exact);
+  M_Ratio ratio;
+  unsigned char status = 0;
+  const bool isGiven = operation.library(&a.shown.ratio, &b.shown.ratio, &ratio, &status) == 0 &&
+                       status == 0 && exact.isExact && ratio == exact.ratio;
+  if (isGiven) return {{ratio, Accuracy::kExact}, exact};
+  if (exact.isExact) return {{exact.ratio, Accuracy::kExact}, exact};
+  if (a.shown.accuracy == Accuracy::kExact && b.shown.accuracy == Accuracy::kExact) {
+    operation.library(&a.shown.ratio, &b.shown.ratio, &ratio, nullptr);
   }
-  if (result.accuracy == Accuracy::kApproximated) {
-    result.maxError = MaxError(operation, a.ratio, a.maxError, b.ratio, b.maxError, result.ratio);
-  }
-  return result;
+  const Accuracy accuracy = exact.IsKnown() ? Accuracy::kApproximated : Accuracy::kOverflow;
+  return {{exact.ratio, accuracy, exact.maxError}, exact};
 }
 
 // A sum that tells whether its operands had to be reduced: then it is not over their least common
 // denominator.
-Value Add(const Value& a, const Value& b) {
-  Value sum = Calculate(M_AddRatio, a, b);
-  const uint64_t common = std::lcm(uint64_t{a.ratio.den}, uint64_t{b.ratio.den});
-  const bool isPlain = a.ratio.num == 0 || b.ratio.num == 0 || sum.ratio.den == common;
-  if (sum.accuracy == Accuracy::kExact && !isPlain) sum.accuracy = Accuracy::kReduced;
+Term Add(const Term& a, const Term& b) {
+  Term sum = Calculate(kAdd, a, b);
+  if (sum.shown.accuracy != Accuracy::kExact) return sum;
+  const M_Ratio &x = a.shown.ratio, &y = b.shown.ratio;
+  const uint64_t common = std::lcm(uint64_t{x.den}, uint64_t{y.den});
+  const bool isPlain = x.num == 0 || y.num == 0 || sum.shown.ratio.den == common;
+  if (!isPlain) sum.shown.accuracy = Accuracy::kReduced;
   return sum;
 }
 
 class SheetMaker {
  public:
-  explicit SheetMaker(const Composition& composition) : composition_(composition) {
-    M_RecipRatio(&composition.frameRate.ratio, &frame_.ratio, nullptr);
-    start_ = Calculate(M_MulRatio, Units(composition.start), frame_);
-    duration_ = Calculate(M_MulRatio, Units(composition.duration), frame_);
-  }
+  explicit SheetMaker(const Composition& composition)
+      : composition_(composition),
+        clock_(composition.frameRate.ratio, false),
+        frame_(Inverse(composition.frameRate.ratio)),
+        start_(Calculate(kMul, Units(composition.start), frame_)),
+        duration_(Calculate(kMul, Units(composition.duration), frame_)),
+        end_(Calculate(kAdd, start_, duration_)) {}
 
   Sheet Make(bool withOverlaps, ReportCollector& collector) const {
     Sheet sheet;
@@ -55,13 +73,10 @@ class SheetMaker {
     sheet.frameRate = composition_.frameRate;
     sheet.start = InFrames(start_);
     sheet.duration = InFrames(duration_);
-    Value sum = {{0, 1}, Accuracy::kExact};
+    Term sum = ToTerm({0, 1});
     for (const Layer& layer : composition_.layers) {
       collector.SetLayer(layer.name);
-      Row row = MakeRow(layer);
-      sum = Add(sum, row.duration.seconds);
-      row.runningSum = sum;
-      sheet.rows.push_back(std::move(row));
+      sheet.rows.push_back(MakeRow(layer, &sum));
     }
     sheet.layout = MakeLayout(composition_, withOverlaps, collector);
     const auto isInSpace = [](const Layer& layer) { return layer.space.has_value(); };
@@ -73,60 +88,66 @@ class SheetMaker {
   }
 
  private:
-  static Value Units(int32_t count) { return {{count, 1}, Accuracy::kExact}; }
+  static Term Units(int32_t count) { return ToTerm({count, 1}); }
 
-  Time InFrames(const Value& seconds) const {
-    if (seconds.accuracy == Accuracy::kOverflow) return {seconds, {0, false, true}};
-    const auto frame = [&](M_Rounding rounding) {
-      return M_FrameAt(seconds.ratio, composition_.frameRate.ratio, rounding);
-    };
-    const bool isWhole = frame(M_Rounding::Floor) == frame(M_Rounding::Ceiling);
-    const bool isExact = isWhole && seconds.accuracy != Accuracy::kApproximated;
-    return {seconds, {frame(M_Rounding::Nearest), isExact, false}};
+  static Term Inverse(M_Ratio rate) {
+    M_RecipRatio(&rate, &rate, nullptr);
+    return ToTerm(rate);
   }
 
-  // Both ends are held to the composition by themselves: M_ClipSpanToSpan would end every layer
-  // where the composition ends.
-  Value Clip(const Value& seconds) const {
-    const Accuracy accuracy = Worse(seconds.accuracy, Worse(start_.accuracy, duration_.accuracy));
-    // What is held may not be where it seems.
-    Value clipped = {{}, accuracy, seconds.maxError + start_.maxError + duration_.maxError};
-    const bool fails =
-        accuracy == Accuracy::kOverflow ||
-        M_ClipRatioToSpan(&seconds.ratio, &start_.ratio, &duration_.ratio, &clipped.ratio);
-    return fails ? kOverflown : clipped;
+  Time InFrames(const Term& term) const {
+    if (term.shown.accuracy == Accuracy::kOverflow) return {term.shown, {0, false, true}};
+    return {term.shown, {clock_.Frame(term.exact), clock_.IsWhole(term.exact), false}};
   }
 
-  Row MakeRow(const Layer& layer) const {
+  // Both ends are held to the composition by themselves.
+  Term Clip(const Term& term) const {
+    if (!start_.exact.IsKnown() || !end_.exact.IsKnown())
+      return {{{0, 0}, Accuracy::kOverflow}, kUnknown};
+    if (term.exact < start_.exact) return start_;
+    return end_.exact < term.exact ? end_ : term;
+  }
+
+  // Seconds a unit of a layer's time base.
+  static Term Unit(const Layer& layer) {
+    return layer.hasSourceRate ? Inverse(layer.timeBase.ratio) : ToTerm(layer.timeBase.ratio);
+  }
+
+  Row MakeRow(const Layer& layer, Term* sum) const {
     Row row;
     row.name = layer.name;
     row.timeBase = layer.timeBase;
     row.hasSourceRate = layer.hasSourceRate;
-    // Seconds a unit of the layer's time base.
-    Value unit = {layer.timeBase.ratio, Accuracy::kExact};
-    if (layer.hasSourceRate) M_RecipRatio(&unit.ratio, &unit.ratio, nullptr);
     row.stretch = layer.stretch;
     row.inUnits = layer.in;
     row.outUnits = layer.out;
-    row.in = InFrames(Calculate(M_MulRatio, Units(layer.in), unit));
-    row.out = InFrames(Calculate(M_MulRatio, Units(layer.out), unit));
-    row.duration = InFrames(Calculate(M_MulRatio, Units(layer.out - layer.in), unit));
-    row.clippedIn = InFrames(Clip(row.in.seconds));
-    row.clippedOut = InFrames(Clip(row.out.seconds));
-    row.clippedDuration =
-        InFrames(Calculate(M_SubRatio, row.clippedOut.seconds, row.clippedIn.seconds));
+    const Term unit = Unit(layer);
+    const Term in = Calculate(kMul, Units(layer.in), unit);
+    const Term out = Calculate(kMul, Units(layer.out), unit);
+    const Term duration = Calculate(kMul, Units(layer.out - layer.in), unit);
+    const Term clippedIn = Clip(in), clippedOut = Clip(out);
+    const Term clipped = Calculate(kSub, clippedOut, clippedIn);
+    row.in = InFrames(in);
+    row.out = InFrames(out);
+    row.duration = InFrames(duration);
+    row.clippedIn = InFrames(clippedIn);
+    row.clippedOut = InFrames(clippedOut);
+    row.clippedDuration = InFrames(clipped);
     const M_Ratio& stretch = layer.stretch.ratio;
-    row.sourceDuration = row.clippedDuration.seconds;
-    if (stretch.num != 1 || stretch.den != 1) {
-      row.sourceDuration = Calculate(M_DivRatio, row.sourceDuration, {stretch, Accuracy::kExact});
-    }
+    const bool isStretched = stretch.num != 1 || stretch.den != 1;
+    row.sourceDuration =
+        isStretched ? Calculate(kDiv, clipped, ToTerm(stretch)).shown : clipped.shown;
+    *sum = Add(*sum, duration);
+    row.runningSum = sum->shown;
     return row;
   }
 
   const Composition& composition_;
-  Value frame_ = {{}, Accuracy::kExact};
-  Value start_;
-  Value duration_;
+  Clock clock_;
+  Term frame_;
+  Term start_;
+  Term duration_;
+  Term end_;
 };
 
 }  // namespace

@@ -83,7 +83,7 @@ std::string Decimal(const Value& value) {
 
 std::string Timecode(const Clock& clock, const Time& time) {
   if (time.frames.hasOverflowed) return Tr("overflow");
-  return Marked(time.frames.isExact, clock.Timecode(time.seconds.ratio));
+  return Marked(time.frames.isExact, clock.Timecode(time.frames.count));
 }
 
 std::string Cells(const Clock& clock, const std::string& label, const std::string& units,
@@ -107,20 +107,26 @@ bool IsClipped(const Row& row) {
 }
 
 std::string Summary(const Sheet& sheet, const Clock& clock) {
-  std::string text = Tr("Composition \"{0}\"", {Printable(sheet.name)}) + "\n  ";
+  std::string text = Tr("Composition \"{0}\"", {Shortened(Printable(sheet.name), 80)}) + "\n  ";
   text +=
       Tr("{0} frames a second, {1} long, starts at {2}",
          {ToRate(sheet.frameRate), Timecode(clock, sheet.duration), Timecode(clock, sheet.start)});
   text += '\n';
   std::set<std::string> rates;
   Doubts doubts;
+  const auto add = [&](const Value& value) {
+    doubts.Add(value.accuracy != Accuracy::kOverflow, value.accuracy != Accuracy::kApproximated,
+               value.maxError);
+  };
+  add(sheet.start.seconds);
+  add(sheet.duration.seconds);
   for (const Row& row : sheet.rows) {
     rates.insert(row.hasSourceRate ? ToRate(row.timeBase) : ToText(row.timeBase) + " s");
-    for (const Time* time : {&row.in, &row.out, &row.duration}) {
-      const Accuracy accuracy = time->seconds.accuracy;
-      doubts.Add(accuracy != Accuracy::kOverflow, accuracy != Accuracy::kApproximated,
-                 time->seconds.maxError);
+    for (const Time* time : {&row.in, &row.out, &row.duration, &row.clippedIn, &row.clippedOut,
+                             &row.clippedDuration}) {
+      add(time->seconds);
     }
+    add(row.sourceDuration);
   }
   text += Line(Tr("layers"), {std::to_string(sheet.rows.size())});
   text += Line(Tr("counted in"), Listed({rates.begin(), rates.end()}));
@@ -163,7 +169,7 @@ Json ToJson(const Row& row) {
 }
 
 std::string Text(const Json& json) {
-  return json.dump(2, ' ', false, Json::error_handler_t::replace);
+  return PrintableJson(json.dump(2, ' ', false, Json::error_handler_t::replace));
 }
 
 }  // namespace

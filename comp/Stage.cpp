@@ -95,6 +95,37 @@ std::vector<Hit> HitsAt(const std::vector<Shape>& shapes, const M_Vector2T<doubl
   return hits;
 }
 
+std::vector<M_Vector2T<double>> ClippedLine(const std::vector<M_Vector2T<double>>& outline,
+                                            const M_FloatRect& box) {
+  using Point = M_Vector2T<double>;
+  if (outline.empty()) return {};
+  const auto farthest = [&](const Point& from) {
+    const auto distance = [&](const Point& p) { return std::hypot(p.x - from.x, p.y - from.y); };
+    return *std::max_element(outline.begin(), outline.end(), [&](const Point& a, const Point& b) {
+      return distance(a) < distance(b);
+    });
+  };
+  const Point start = farthest(outline[0]), end = farthest(start);
+  // From side to side, the part of the way that is in.
+  double first = 0, last = 1;
+  const auto hold = [&](double from, double to, double low, double high) {
+    const double way = to - from;
+    if (way == 0 && (from < low || from > high)) last = -1;
+    if (way == 0) return;
+    const double a = (low - from) / way, b = (high - from) / way;
+    first = std::max(first, std::min(a, b));
+    last = std::min(last, std::max(a, b));
+  };
+  hold(start.x, end.x, box.left, box.right);
+  hold(start.y, end.y, box.top, box.bottom);
+  const double length = std::hypot(end.x - start.x, end.y - start.y);
+  if (!std::isfinite(length) || !(first <= last)) return {};
+  const auto at = [&](double t) {
+    return Point{start.x + (end.x - start.x) * t, start.y + (end.y - start.y) * t};
+  };
+  return {at(first), at(last)};
+}
+
 Homogeneous Clipped(const std::vector<M_Vector2T<double>>& outline, const M_FloatRect& box) {
   Homogeneous part;
   for (const auto& p : outline) {
@@ -106,6 +137,10 @@ Homogeneous Clipped(const std::vector<M_Vector2T<double>>& outline, const M_Floa
                                {box.right, box.bottom, 0, 1},
                                {box.left, box.bottom, 0, 1}};
   M_PolyPolyClip2D(&clipper, &part, &part);
+  // What is too far away to be cut.
+  for (const auto& p : part) {
+    if (!std::isfinite(p.x) || !std::isfinite(p.y)) return {};
+  }
   return part;
 }
 

@@ -54,6 +54,11 @@ std::vector<Hit> HitsAt(const std::vector<Shape>& shapes, const M_Vector2T<doubl
 
 using Homogeneous = std::vector<M_Vector4T<double>>;
 
+/// The ends of what is in a box of a layer that is seen from the side; nothing where that is
+/// nothing, or not finite.
+std::vector<M_Vector2T<double>> ClippedLine(const std::vector<M_Vector2T<double>>& outline,
+                                            const M_FloatRect& box);
+
 /// The part of an outline in a box; nothing where it is not finite.
 Homogeneous Clipped(const std::vector<M_Vector2T<double>>& outline, const M_FloatRect& box);
 

@@ -1,6 +1,7 @@
 #include "Text.h"
 
 #include <algorithm>
+#include <cstdio>
 #include <iterator>
 
 namespace comp {
@@ -48,7 +49,7 @@ constexpr Interval kWide[] = {{0x1100, 0x115F}, {0x2E80, 0xA4CF},   {0xAC00, 0xD
 constexpr Interval kNarrow[] = {
     {0x300, 0x36F}, {0x200B, 0x200D}, {0x20D0, 0x20FF}, {0xFE00, 0xFE0F}};
 
-size_t Width(char32_t code) {
+size_t Columns(char32_t code) {
   if (code < 0x300) return 1;
   if (IsIn(code, std::begin(kNarrow), std::end(kNarrow))) return 0;
   return IsIn(code, std::begin(kWide), std::end(kWide)) ? 2 : 1;
@@ -68,6 +69,28 @@ std::string Printable(std::string_view text) {
     }
   }
   return printable;
+}
+
+std::string PrintableJson(std::string json) {
+  // The first bytes of all that a writer of JSON leaves as it is.
+  constexpr const char* kFirst = "\x7F\xC2\xE2";
+  size_t at = json.find_first_of(kFirst);
+  if (at == std::string::npos) return json;
+  std::string printable;
+  for (size_t from = 0;; at = json.find_first_of(kFirst, from)) {
+    printable.append(json, from, at - from);
+    if (at == std::string::npos) return printable;
+    std::string_view rest = std::string_view(json).substr(at);
+    const Character c = Take(&rest);
+    if (IsIn(c.code, std::begin(kUnprintable), std::end(kUnprintable))) {
+      char escaped[8];
+      std::snprintf(escaped, sizeof escaped, "\\u%04x", static_cast<unsigned>(c.code));
+      printable += escaped;
+    } else {
+      printable += c.bytes;
+    }
+    from = at + c.bytes.size();
+  }
 }
 
 std::string Escaped(std::string_view text) {
@@ -92,18 +115,41 @@ std::string Escaped(std::string_view text) {
 
 size_t Columns(std::string_view text) {
   size_t columns = 0;
-  while (!text.empty()) columns += Width(Take(&text).code);
+  while (!text.empty()) columns += Columns(Take(&text).code);
   return columns;
 }
 
 std::string Shortened(std::string_view text, size_t columns) {
   size_t used = 0, end = 0;
   for (std::string_view rest = text; !rest.empty();) {
-    used += Width(Take(&rest).code);
+    used += Columns(Take(&rest).code);
     if (used > columns) return std::string(text.substr(0, end)).append(columns > 0 ? "…" : "");
     if (used < columns) end = text.size() - rest.size();
   }
   return std::string(text);
+}
+
+double Width(std::string_view text) {
+  double width = 0;
+  while (!text.empty()) {
+    const char32_t code = Take(&text).code;
+    const bool isBroad =
+        code == 'm' || code == 'w' || code == 'M' || code == 'W' || code == '@' || code == '%';
+    const bool isSmall = (code >= 'a' && code <= 'z') || (code >= '0' && code <= '9') || code < 'A';
+    width += Columns(code) == 0 ? 0 : Columns(code) == 2 || isBroad ? 1 : isSmall ? 0.64 : 0.8;
+  }
+  return width;
+}
+
+std::string Fitted(const std::string& text, double width) {
+  if (Width(text) <= width) return text;
+  size_t columns = 0;
+  std::string fitted;
+  for (std::string next = Shortened(text, 1); Width(next) <= width;
+       next = Shortened(text, ++columns)) {
+    fitted = next;
+  }
+  return columns < 3 ? "" : fitted;
 }
 
 std::string PadRight(std::string text, size_t columns) {

@@ -16,11 +16,20 @@ std::string Printable(std::string_view text);
 /// The same, with what XML writes otherwise.
 std::string Escaped(std::string_view text);
 
+/// JSON in which what no terminal should see is escaped.
+std::string PrintableJson(std::string json);
+
 /// The columns that a text takes in a terminal: two for an ideograph or a kana, none for an accent.
 size_t Columns(std::string_view text);
 
 /// The text or, with dots, as much of it as there is room for.
 std::string Shortened(std::string_view text, size_t columns);
+
+/// The width of a text in a proportional font by its height: rather too much than too little.
+double Width(std::string_view text);
+
+/// The text or, with dots, as much of it as so much width holds; nothing if that is too little.
+std::string Fitted(const std::string& text, double width);
 
 /// Padded on the right to so many columns.
 std::string PadRight(std::string text, size_t columns);

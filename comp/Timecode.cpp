@@ -73,16 +73,17 @@ std::optional<int64_t> ParseTimecode(std::string_view text, const M_Ratio& rate)
   return isNegative ? -frame : frame;
 }
 
-int64_t Clock::Frame(const M_Ratio& seconds) const {
-  return M_FrameAt(seconds, rate_, M_Rounding::Nearest);
+int64_t Clock::Frame(const Seconds& time) const {
+  if (time.isExact) return M_FrameAt(time.ratio, rate_, M_Rounding::Nearest);
+  const auto frames = Product(time.Value(), Fraction(rate_));
+  const auto raised = frames ? Sum(*frames, Fraction(1, 2)) : std::nullopt;
+  if (!raised) return M_FrameAt(time.ratio, rate_, M_Rounding::Nearest);
+  return static_cast<int64_t>(raised->Floor());
 }
 
-bool Clock::IsWhole(const M_Ratio& seconds) const {
-  return M_FrameAt(seconds, rate_) == M_FrameAt(seconds, rate_, M_Rounding::Ceiling);
-}
-
-std::string Clock::Timecode(const M_Ratio& seconds) const {
-  return ToTimecode(Frame(seconds), rate_, isDropped_);
+bool Clock::IsWhole(const Seconds& time) const {
+  const auto frames = Product(time.Value(), Fraction(rate_));
+  return time.IsCertain() && frames && frames->den == 1;
 }
 
 }  // namespace comp

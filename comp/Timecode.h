@@ -9,6 +9,7 @@
 #include <string_view>
 
 #include "M_Utils.h"
+#include "Seconds.h"
 
 namespace comp {
 
@@ -31,10 +32,11 @@ class Clock {
   Clock(const M_Ratio& rate, bool mayDrop) : rate_(rate), isDropped_(mayDrop && MayDrop(rate)) {}
 
   /// The nearest.
-  int64_t Frame(const M_Ratio& seconds) const;
-  /// Whether a frame begins just then.
-  bool IsWhole(const M_Ratio& seconds) const;
-  std::string Timecode(const M_Ratio& seconds) const;
+  int64_t Frame(const Seconds& time) const;
+  /// Whether it is certain that a frame begins just then.
+  bool IsWhole(const Seconds& time) const;
+  std::string Timecode(const Seconds& time) const { return Timecode(Frame(time)); }
+  std::string Timecode(int64_t frame) const { return ToTimecode(frame, rate_, isDropped_); }
 
  private:
   M_Ratio rate_;

@@ -11,31 +11,9 @@
 #include "M_Matrix.h"
 #include "M_Ops.h"
 #include "M_Utils.h"
+#include "Seconds.h"
 
 namespace comp {
-
-/// A time, or a span of it, in seconds: exact, or a ratio near it that fits, or nothing that does
-/// (0/0).
-struct Seconds {
-  M_Ratio ratio = {0, 1};
-  bool isExact = true;
-  double maxError = 0;  ///< How far from the exact one it may be.
-
-  bool IsKnown() const { return ratio.den != 0; }
-};
-
-using Operation = decltype(M_AddRatio)*;
-
-/// How far the library's sum, difference, product or quotient of two ratios may be from the exact
-/// one, where the operands may be off by so much.
-double MaxError(Operation operation, const M_Ratio& a, double aError, const M_Ratio& b,
-                double bError, const M_Ratio& result);
-
-/// As exact as its operands, where the result fits.
-Seconds operator+(const Seconds& a, const Seconds& b);
-Seconds operator-(const Seconds& a, const Seconds& b);
-Seconds operator*(const Seconds& a, const Seconds& factor);
-bool operator<(const Seconds& a, const Seconds& b);
 
 struct Marker {
   std::string name;
@@ -49,7 +27,7 @@ struct Item {
   std::string name;
   Seconds recordIn, recordOut;             ///< From the timeline's start.
   Seconds sourceIn, sourceOut;             ///< As the media counts.
-  M_Ratio speed = {1, 1};                  ///< Seconds of the source a second; below 0 backwards.
+  Seconds speed = M_Ratio{1, 1};           ///< Of the source a second; below 0 backwards.
   std::optional<M_Vector2T<double>> size;  ///< Of the medium's picture, where the file tells it.
 };
 
@@ -67,6 +45,7 @@ struct Timeline {
   Seconds start;  ///< What the first frame is called, as a time.
   Seconds duration;
   std::vector<Track> tracks;
+  std::vector<Marker> markers;       ///< Of all tracks together.
   std::set<M_Ratio> rates;           ///< All that are met.
   std::vector<std::string> remarks;  ///< What was passed over, or is not as it should be.
 };

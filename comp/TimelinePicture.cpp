@@ -15,7 +15,7 @@ namespace comp {
 namespace {
 
 constexpr double kWidth = 960, kLeft = 110, kRight = 20, kTop = 80, kLane = 34, kBar = 26;
-constexpr double kColumn = 6.2;  // The width of a letter, about.
+constexpr double kSize = 11;  // Of letters.
 
 double ToDouble(const Seconds& time) {
   return time.IsKnown() ? time.ratio.num / static_cast<double>(time.ratio.den) : 0;
@@ -49,12 +49,6 @@ std::string Text(double x, double y, const std::string& attributes, const std::s
                Escaped(text));
 }
 
-// As much of a text as there is room for; nothing if that is too little.
-std::string Fitted(const std::string& text, double room) {
-  const auto columns = static_cast<size_t>(std::max(0.0, room / kColumn));
-  return columns < 3 && Columns(text) > columns ? "" : Shortened(text, columns);
-}
-
 class Drawing {
  public:
   Drawing(const Timeline& timeline, bool mayDrop)
@@ -70,7 +64,7 @@ class Drawing {
                   "font-family=\"sans-serif\" font-size=\"11\">\n",
                   kWidth, height);
     std::string svg = head + Shape("title", "", Escaped(timeline_.name)) + kStyle;
-    svg += Text(kLeft, 18, "font-size=\"14\"", Fitted(timeline_.name, 600));
+    svg += Text(kLeft, 18, "font-size=\"14\"", Fitted(timeline_.name, 600 / 14.0));
     char length[64];
     std::snprintf(length, sizeof length, "%.3f s", ToDouble(timeline_.duration));
     svg += Text(kWidth - kRight, 18, "class=\"quiet\" text-anchor=\"end\"",
@@ -89,7 +83,7 @@ class Drawing {
     return std::clamp(x, kLeft, kWidth - kRight);
   }
   std::string Timecode(const Seconds& time) const {
-    return time.IsKnown() ? clock_.Timecode(time.ratio) : "?";
+    return time.IsKnown() ? clock_.Timecode(time) : "?";
   }
 
   // The kinds that there are.
@@ -107,7 +101,7 @@ class Drawing {
                        "\" y=\"30\" width=\"12\" height=\"12\" rx=\"2\"",
                    "");
       svg += Text(x + 17, 40, "class=\"quiet\"", name);
-      x += 36 + kColumn * static_cast<double>(Columns(name));
+      x += 36 + kSize * Width(name);
     };
     for (size_t i = 0; i < std::size(kKinds); ++i) {
       if (isThere[i]) add(kClasses[i], Tr(kKinds[i]));
@@ -120,12 +114,14 @@ class Drawing {
   std::string Ruler(double height) const {
     constexpr int32_t kSteps[] = {1,   2,   5,    10,   15,   30,    60,    120,  300,
                                   600, 900, 1800, 3600, 7200, 14400, 43200, 86400};
-    const auto* step = std::find_if(std::begin(kSteps), std::end(kSteps) - 1,
-                                    [&](int32_t s) { return length_ / s <= 8; });
+    const auto* known = std::find_if(std::begin(kSteps), std::end(kSteps) - 1,
+                                     [&](int32_t s) { return length_ / s <= 8; });
+    int32_t step = *known;
+    while (length_ / step > 8 && step < INT32_MAX / 16) step *= 2;
     std::string svg;
-    const auto last = static_cast<int32_t>(std::min(length_ / *step, 1000.0));
+    const auto last = static_cast<int32_t>(length_ / step);
     for (int32_t i = 0; i <= last; ++i) {
-      const Seconds time = {{i * *step, 1}, true};
+      const Seconds time = M_Ratio{i * step, 1};
       const std::string x = ToText(X(time));
       svg += Shape("line",
                    std::string("class=\"rule\" x1=\"").append(x).append("\" x2=\"").append(x) +
@@ -145,7 +141,8 @@ class Drawing {
                   kWidth - kLeft - kRight, kBar);
     const std::string label = track.kind + ' ' + std::to_string(number + 1);
     std::string svg = Shape("rect", rectangle, Shape("title", "", Escaped(track.name)));
-    svg += Text(8, y + 17, "", Fitted(track.name.empty() ? label : track.name, kLeft - 16));
+    svg +=
+        Text(8, y + 17, "", Fitted(track.name.empty() ? label : track.name, (kLeft - 16) / kSize));
     // Transitions lie on what they join.
     for (const bool areTransitions : {false, true}) {
       for (const Item& item : track.items) {
@@ -165,7 +162,8 @@ class Drawing {
 
   std::string Bar(const Item& item, double y) const {
     const double left = X(item.recordIn), right = X(item.recordOut), width = right - left;
-    const std::string speed = item.speed == M_Ratio{1, 1} ? "" : " x " + SpeedText(item.speed);
+    const std::string speed =
+        item.speed.ratio == M_Ratio{1, 1} ? "" : " x " + SpeedText(item.speed.ratio);
     const std::string title = Shape("title", "",
                                     Escaped(item.name + speed) + ", " + Timecode(item.recordIn) +
                                         " - " + Timecode(item.recordOut));
@@ -184,12 +182,12 @@ class Drawing {
                                 ToText(kBar - 2) + "\" rx=\"2\"",
                             title);
     if (item.kind == Item::Kind::kGap) return svg;
-    const std::string name = Fitted(item.name + speed, width - 8);
+    const std::string name = Fitted(item.name + speed, (width - 8) / kSize);
     return name.empty() ? svg : svg + Text(left + 4, y + 17, "class=\"name\"", name);
   }
 
   static std::string SpeedText(const M_Ratio& speed) {
-    return ToText(speed.num / static_cast<double>(speed.den));
+    return speed.den == 0 ? "?" : ToText(speed.num / static_cast<double>(speed.den));
   }
 
   const Timeline& timeline_;

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
+#include <cstdlib>
 
 #include "Language.h"
 #include "M_Ops.h"
@@ -13,7 +14,10 @@ namespace comp {
 
 std::string ToText(double number) {
   char text[32];
-  std::snprintf(text, sizeof text, "%.10g", std::round(number * 1000) / 1000 + 0.0);
+  // Beyond that there are no thousandths.
+  const bool isLarge = !(std::abs(number) < 1e12);
+  std::snprintf(text, sizeof text, "%.10g",
+                isLarge ? number : std::round(number * 1000) / 1000 + 0.0);
   return text;
 }
 
@@ -48,15 +52,26 @@ std::string RateText(const M_Ratio& rate) {
   return std::string(decimal).append(" (").append(RatioText(rate)).append(")");
 }
 
+std::string BoundText(double bound) {
+  char text[32];
+  std::snprintf(text, sizeof text, "%.1g", bound);
+  // Rounded down it would be none.
+  if (std::strtod(text, nullptr) < bound) {
+    const double unit = std::pow(10, std::floor(std::log10(bound)));
+    std::snprintf(text, sizeof text, "%.1g", (std::floor(bound / unit) + 1) * unit);
+  }
+  return text;
+}
+
 std::string SecondsText(const M_Ratio& seconds, double maxError) {
   char text[80];
   const double value = seconds.num / static_cast<double>(seconds.den);
   if (maxError == 0) {
     std::snprintf(text, sizeof text, "%.6f", value);
-  } else {
-    std::snprintf(text, sizeof text, "~%.*f ±%.1g", maxError < 1e-3 ? 6 : 3, value, maxError);
+    return text;
   }
-  return text;
+  std::snprintf(text, sizeof text, "~%.*f ±", maxError < 1e-3 ? 6 : 3, value);
+  return text + BoundText(maxError);
 }
 
 void Doubts::Add(bool isKnown, bool isExact, double maxError) {
@@ -68,8 +83,7 @@ void Doubts::Add(bool isKnown, bool isExact, double maxError) {
 
 std::string Doubts::Text() const {
   if (approximated_ + unknown_ == 0) return Tr("All times are exact.");
-  char most[32];
-  std::snprintf(most, sizeof most, "%.1g", maxError_);
+  const std::string most = BoundText(maxError_);
   const std::string all = std::to_string(all_);
   std::string text;
   if (approximated_ > 0) {

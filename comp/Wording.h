@@ -27,6 +27,9 @@ std::string RatioText(const M_Ratio& ratio);
 /// A rate, "25" or "29.97 (30000/1001)".
 std::string RateText(const M_Ratio& rate);
 
+/// One digit of a number, which is not below it.
+std::string BoundText(double bound);
+
 /// A time in seconds with six decimals; where it is not exact, by how much it may be off.
 std::string SecondsText(const M_Ratio& seconds, double maxError);
 

@@ -92,13 +92,15 @@ void Say(const std::string& sentence) {
 
 // A whole file; "-" is the standard input.
 std::string ReadText(const std::string& fileName) {
-  std::ostringstream text;
   std::ifstream file;
   if (fileName != "-") file.open(fileName);
   std::istream& in = fileName == "-" ? std::cin : file;
-  if (!(text << in.rdbuf()) && !in.eof())
-    throw comp::InputError(Tr("{0}: cannot be read.", {fileName}));
-  return text.str();
+  try {
+    if (in) return {std::istreambuf_iterator<char>(in), {}};
+  } catch (const std::ios_base::failure&) {
+    // A folder, or a file that is gone.
+  }
+  throw comp::InputError(Tr("{0}: cannot be read.", {fileName}));
 }
 
 struct Arguments {
@@ -157,15 +159,22 @@ void AddOptions(CLI::App* app, Arguments* arguments) {
       },
       "");
   comp::PictureOptions& picture = arguments->picture;
-  app->set_version_flag("--version", COMP_VERSION);
+  app->set_help_flag("-h,--help", Tr("prints this help and exits"));
+  app->set_version_flag("--version", COMP_VERSION, Tr("prints the version and exits"));
+  for (const char* label :
+       {Later("Usage"), Later("OPTIONS"), Later("Positionals"), Later("Options"), Later("REQUIRED"),
+        Later("Needs"), Later("Excludes")}) {
+    app->get_formatter()->label(label, Tr(label));
+  }
   app->add_option("FILE", arguments->fileNames, Tr("compositions and timelines"))->required();
   auto* const json = app->add_flag("--json", arguments->asJson, Tr("prints sheets as JSON"));
-  app->add_flag("--csv", arguments->asCsv, Tr("prints timelines as comma-separated values"))
-      ->excludes(json);
+  auto* const csv =
+      app->add_flag("--csv", arguments->asCsv, Tr("prints timelines as comma-separated values"))
+          ->excludes(json);
   app->add_flag("--overlaps", arguments->withOverlaps, Tr("also what layers have in common"));
   app->add_flag("--drop-frame", arguments->mayDrop, Tr("timecode of 29.97 and 59.94 drops frames"));
   auto* const svg =
-      app->add_option("--svg", arguments->svg, Tr("the file to draw to"))->excludes(json);
+      app->add_option("--svg", arguments->svg, Tr("the file to draw to"))->excludes(json, csv);
   app->add_option("--time", picture.frame,
                   Tr("as it is at a frame; else with every layer, at its first key"))
       ->needs(svg)
@@ -183,7 +192,8 @@ void AddOptions(CLI::App* app, Arguments* arguments) {
   app->add_option("--tolerance", picture.tolerance,
                   Tr("pixels by which a hit may be beside a layer"))
       ->needs(svg)
-      ->check(finite);
+      ->check(finite)
+      ->check(CLI::NonNegativeNumber);
   app->add_option("--grid", picture.grid,
                   Tr("draws N x N points in the colours of the layers they hit"))
       ->needs(svg)
@@ -202,7 +212,13 @@ std::string MakePicture(const Arguments& arguments, comp::Progress* progress) {
   progress->Say(comp::Printable(fileName));
   const std::string given = ReadText(fileName);
   if (comp::IsOtio(given)) {
-    WriteFile(arguments.svg, comp::Draw(comp::ReadOtio(given, fileName)[0], arguments.mayDrop));
+    const comp::PictureOptions& picture = arguments.picture;
+    if (picture.frame || picture.point || picture.grid > 0) {
+      throw comp::InputError(Tr("{0}: --time, --hit and --grid are for compositions.", {fileName}));
+    }
+    const auto timelines = comp::ReadOtio(given, fileName);
+    WriteFile(arguments.svg, comp::Draw(timelines[0], arguments.mayDrop));
+    if (timelines.size() > 1) Say(Tr("{0}: only the first timeline is drawn.", {fileName}));
     return "";
   }
   const comp::Composition composition = comp::ReadComposition(given, fileName);
@@ -237,7 +253,8 @@ int Run(int argc, char** argv) {
   } catch (const CLI::Success& asked) {
     return app.exit(asked);
   } catch (const CLI::ParseError& error) {
-    Say(Tr("{0}; see comp --help.", {error.what()}));
+    const bool isMissing = error.get_name() == "RequiredError";
+    Say(Tr("{0}; see comp --help.", {isMissing ? Tr("FILE is required") : error.what()}));
     return kBadInput;
   }
   // Birth and death are logged; a command line tool has no use for that.

@@ -52,7 +52,7 @@ TEST(Rates, AreWhatDecimalsStandFor) {
       {"23.97", {2397, 100}, true},
       {"1.25e-3", {1, 800}, true},
       {"-0.8545454545454545", {-47, 55}, true},
-      {"3.14159265358979", {13176795, 4194304}, false}};
+      {"3.14159265358979", {1434877259, 456735617}, false}};
   for (const auto& [text, ratio, isExact] : rows) {
     const auto read = comp::ToRatio(text, true);
     EXPECT_TRUE(read && read->ratio == ratio && read->isExact == isExact) << text;

@@ -73,7 +73,12 @@ Json ToJson(const comp::Time& time, const comp::Clock& clock) {
           {"isExact", time.seconds.accuracy != comp::Accuracy::kApproximated},
           {"frame", time.frames.count},
           {"isWholeFrame", time.frames.isExact},
-          {"timecode", clock.Timecode(time.seconds.ratio)}};
+          {"timecode", clock.Timecode(time.frames.count)}};
+}
+
+Json ToJson(const std::optional<comp::Camera>& camera) {
+  if (!camera) return {};
+  return {ToJson(camera->eye), ToJson(camera->target), ToJson(camera->up), camera->zoom};
 }
 
 class Viewer {
@@ -89,26 +94,37 @@ class Viewer {
     std::setlocale(LC_MESSAGES, language == "en" ? "C" : language.c_str());
   }
 
-  /// Opens a file. What was open stays where this one cannot be used.
-  std::string Open(const std::string& text, const std::string& name) {
+  /// Opens a file. What was open stays where this one cannot be used. The camera stays where it is
+  /// the same file, edited, unless its own has moved.
+  std::string Open(const std::string& text, const std::string& name, bool isEdited) {
     try {
       if (comp::IsOtio(text)) {
         auto timelines = comp::ReadOtio(text, name);
+        Forget();
         timelines_ = std::move(timelines);
-        composition_.reset();
-        reports_.clear();
-        return OpenedTimelines();
+        return Choose(0);
       }
       comp::Composition composition = comp::ReadComposition(text, name);
-      timelines_.clear();
-      reports_.clear();
+      comp::Sheet sheet = comp::MakeSheet(composition);
+      std::string opened = Opened(composition, sheet);
+      const auto camera = composition.camera;
+      if (isEdited && composition_ && Text(ToJson(camera)) == Text(ToJson(camera_))) {
+        composition.camera = composition_->camera;
+      }
+      Forget();
       composition_ = std::move(composition);
-      sheet_ = comp::MakeSheet(*composition_);
-      camera_ = composition_->camera;
-      return OpenedComposition();
+      sheet_ = std::move(sheet);
+      camera_ = camera;
+      return opened;
     } catch (const comp::InputError& error) {
       return Text({{"error", error.what()}, {"line", error.line}, {"column", error.column}});
     }
+  }
+
+  /// Of several timelines, another one.
+  std::string Choose(size_t timeline) {
+    chosen_ = std::min(timeline, timelines_.size() - 1);
+    return Opened(*Timeline(), timelines_);
   }
 
   /// The sheet of what is open, as the program prints it.
@@ -121,6 +137,7 @@ class Viewer {
 
   /// The time of a frame: timecode, exact seconds.
   std::string TimeOf(double frame) const {
+    const comp::ReportCollector reported;
     const M_Ratio rate = Rate();
     const auto count = static_cast<int64_t>(frame);
     Json json = {{"timecode", comp::ToTimecode(count, rate, mayDrop_ && comp::MayDrop(rate))},
@@ -155,19 +172,20 @@ class Viewer {
           cut.push_back({shape.solid.clipPoints[i].x, shape.solid.clipPoints[i].y});
         }
       }
-      const bool isCut = cut.size() == 2;
+      const std::vector<Point> line = comp::ClippedLine(cut, box);
+      const bool isCut = line.size() == 2;
       numbers_.push_back(static_cast<double>(shape.number));
       numbers_.push_back((shape.isEdgeOn ? 1 : 0) + (isCut ? 2 : 0));
       const size_t count = numbers_.size();
       numbers_.push_back(0);
       if (shape.isEdgeOn) {
-        for (const Point& p : shape.outline) Put(Held(p, box));
+        for (const Point& p : comp::ClippedLine(shape.outline, box)) Put(p);
       } else {
         for (const auto& p : comp::Clipped(shape.outline, box)) Put({p.x, p.y});
       }
       numbers_[count] = static_cast<double>((numbers_.size() - count - 1) / 2);
       if (isCut) {
-        for (const Point& p : cut) Put(Held(p, box));
+        for (const Point& p : line) Put(p);
       }
     }
     return View();
@@ -179,6 +197,7 @@ class Viewer {
     for (const comp::Shape& shape : shapes_) {
       all.insert(all.end(), shape.outline.begin(), shape.outline.end());
     }
+    std::erase_if(all, [](const Point& p) { return !std::isfinite(p.x) || !std::isfinite(p.y); });
     M_ComputeConvexHull(all.cbegin(), all.cend(), all);
     numbers_.clear();
     for (const auto& p : comp::Clipped(all, Box())) Put({p.x, p.y});
@@ -207,6 +226,7 @@ class Viewer {
   /// All about a layer at a frame.
   std::string Layer(size_t number, double frame) const {
     if (!composition_ || number >= composition_->layers.size()) return "null";
+    const comp::ReportCollector reported;
     const comp::Layer& layer = composition_->layers[number];
     const comp::Row& row = sheet_->rows[number];
     const comp::Clock clock(Rate(), mayDrop_);
@@ -222,7 +242,8 @@ class Viewer {
       for (int i = 0; i < 4; ++i) {
         const Point p = shape.isInSpace ? Point{shape.solid.points[i].x, shape.solid.points[i].y}
                                         : shape.flat.points[i];
-        screen.push_back(shape.isInSpace && shape.solid.clipped[i] ? Json() : Json{p.x, p.y});
+        screen.push_back(shape.isInSpace && shape.solid.clipped[i] ? Json("before the near plane")
+                                                                   : Json{p.x, p.y});
       }
       json["screen"] = screen;
     }
@@ -231,26 +252,32 @@ class Viewer {
 
   /// The picture of what is open, as the program draws it.
   std::string Svg(double frame) const {
-    if (!timelines_.empty()) return comp::Draw(timelines_[0], mayDrop_);
+    if (Timeline()) return comp::Draw(*Timeline(), mayDrop_);
     if (!composition_ || !composition_->size) return "";
     comp::PictureOptions options;
     options.frame = frame;
     return comp::Draw(*composition_, options).svg;
   }
 
-  // The camera, degrees and pixels. It goes round its target; "down" is y.
+  // The camera, degrees and pixels.
+
+  /// Round the target: about the direction that is up, and above or below the level of the target.
   void Orbit(double yaw, double pitch) {
     comp::Camera* const camera = Camera();
     if (!camera) return;
     Vector arm = Difference(camera->eye, camera->target);
-    const double level = std::hypot(arm.x, arm.z);
-    // Never quite over the target, where there is no up.
-    const double now = std::atan2(-arm.y, level) / kDegree;
+    const M_Matrix4 view = comp::MakeView(*camera);
+    const Vector& up = camera->up;
+    const double product = Length(arm) * Length(up);
+    if (!(product > 0)) return;
+    const double sine = (arm.x * up.x + arm.y * up.y + arm.z * up.z) / product;
+    // Never quite over the target, where nothing is level.
+    const double now = std::asin(std::clamp(sine, -1.0, 1.0)) / kDegree;
     const double most = 89.5, turn = std::clamp(now + pitch, -most, most) - now;
     M_Matrix4 m;
     M_IdentityMatrix4(&m);
-    if (level > 0) M_RotateMatrix4(&m, -arm.z / level, 0, arm.x / level, -turn * kDegree);
-    M_RotateMatrix4(&m, 0, 1, 0, yaw * kDegree);
+    M_RotateMatrix4(&m, view.m[0][0], view.m[1][0], view.m[2][0], -turn * kDegree);
+    M_RotateMatrix4(&m, up.x, up.y, up.z, -yaw * kDegree);
     M_Transform3DFloatPoints(&m, 1, &arm);
     camera->eye = {camera->target.x + arm.x, camera->target.y + arm.y, camera->target.z + arm.z};
   }
@@ -260,7 +287,7 @@ class Viewer {
     if (!camera) return;
     const M_Matrix4 view = comp::MakeView(*camera);
     const Vector arm = Difference(camera->eye, camera->target);
-    const double scale = std::sqrt(arm.x * arm.x + arm.y * arm.y + arm.z * arm.z) / camera->zoom;
+    const double scale = Length(arm) / camera->zoom;
     for (Vector* const point : {&camera->eye, &camera->target}) {
       point->x += scale * (right * view.m[0][0] + down * view.m[0][1]);
       point->y += scale * (right * view.m[1][0] + down * view.m[1][1]);
@@ -273,8 +300,11 @@ class Viewer {
     comp::Camera* const camera = Camera();
     if (!camera) return;
     const Vector arm = Difference(camera->eye, camera->target);
-    camera->eye = {camera->target.x + arm.x * factor, camera->target.y + arm.y * factor,
-                   camera->target.z + arm.z * factor};
+    const double length = Length(arm), nearest = 1, farthest = 1e7;
+    if (!(length > 0)) return;
+    const double by = std::clamp(length * factor, nearest, farthest) / length;
+    camera->eye = {camera->target.x + arm.x * by, camera->target.y + arm.y * by,
+                   camera->target.z + arm.z * by};
   }
 
   void ResetCamera() {
@@ -283,9 +313,7 @@ class Viewer {
 
   /// [eye, target, up, zoom], and back.
   std::string CameraText() const {
-    if (!composition_ || !composition_->camera) return "null";
-    const comp::Camera& camera = *composition_->camera;
-    return Text({ToJson(camera.eye), ToJson(camera.target), ToJson(camera.up), camera.zoom});
+    return Text(composition_ ? ToJson(composition_->camera) : Json());
   }
   void SetCamera(const std::string& text) {
     comp::Camera* const camera = Camera();
@@ -321,24 +349,35 @@ class Viewer {
   static Vector Difference(const Vector& a, const Vector& b) {
     return {a.x - b.x, a.y - b.y, a.z - b.z};
   }
-  static Point Held(const Point& p, const M_FloatRect& box) {
-    return {std::clamp(p.x, box.left, box.right), std::clamp(p.y, box.top, box.bottom)};
+  static double Length(const Vector& v) { return std::hypot(v.x, v.y, v.z); }
+
+  void Forget() {
+    composition_.reset();
+    sheet_.reset();
+    timelines_.clear();
+    shapes_.clear();
+    reports_.clear();
+  }
+
+  const comp::Timeline* Timeline() const {
+    return timelines_.empty() ? nullptr : &timelines_[chosen_];
   }
 
   M_Ratio Rate() const {
     if (composition_) return composition_->frameRate.ratio;
-    return timelines_.empty() ? M_Ratio{24, 1} : timelines_[0].rate;
+    return Timeline() ? Timeline()->rate : M_Ratio{24, 1};
   }
 
   comp::Camera* Camera() {
     return composition_ && composition_->camera ? &*composition_->camera : nullptr;
   }
 
-  // What the page may show: the frame with as much again on each side.
+  // More than the page shows round the frame.
   M_FloatRect Box() const {
     if (!composition_ || !composition_->size) return {0, 0, 0, 0};
     const double width = composition_->size->width, height = composition_->size->height;
-    return {-width, -height, 2 * width, 2 * height};
+    const double margin = 2 * std::max(width, height);
+    return {-margin, -margin, width + margin, height + margin};
   }
 
   void Put(const Point& p) {
@@ -349,11 +388,10 @@ class Viewer {
     return emscripten::val(emscripten::typed_memory_view(numbers_.size(), numbers_.data()));
   }
 
-  std::string OpenedComposition() {
-    const comp::Composition& c = *composition_;
+  static std::string Opened(const comp::Composition& c, const comp::Sheet& sheet) {
     Json names = Json::array(), ins = Json::array(), outs = Json::array(), seen = Json::array();
     for (size_t i = 0; i < c.layers.size(); ++i) {
-      const comp::Row& row = sheet_->rows[i];
+      const comp::Row& row = sheet.rows[i];
       names.push_back(c.layers[i].name);
       const auto frame = [](const comp::Time& time) {
         return time.frames.hasOverflowed ? Json() : Json(time.frames.count);
@@ -372,25 +410,28 @@ class Viewer {
                  {"ins", std::move(ins)},
                  {"outs", std::move(outs)},
                  {"seen", std::move(seen)},
-                 {"reports", ToJson(sheet_->reports)}};
+                 {"reports", ToJson(sheet.reports)}};
     if (c.size) json["size"] = {c.size->width, c.size->height};
     return Text(json);
   }
 
-  std::string OpenedTimelines() const {
-    const comp::Timeline& timeline = timelines_[0];
+  std::string Opened(const comp::Timeline& timeline,
+                     const std::vector<comp::Timeline>& timelines) const {
     const comp::Clock clock(timeline.rate, mayDrop_);
     const auto frame = [&](const comp::Seconds& time) {
-      return time.IsKnown() ? clock.Frame(time.ratio) : 0;
+      return time.IsKnown() ? clock.Frame(time) : 0;
     };
-    return Text(
-        {{"kind", "timeline"},
-         {"name", timeline.name},
-         {"rate", comp::RateText(timeline.rate)},
-         {"start", frame(timeline.start)},
-         {"duration", frame(timeline.duration)},
-         {"tracks", Json::parse(comp::ToJson({timeline}, mayDrop_))["timelines"][0]["tracks"]},
-         {"remarks", timeline.remarks}});
+    Json names = Json::array();
+    for (const comp::Timeline& each : timelines) names.push_back(each.name);
+    Json all = Json::parse(comp::ToJson({timeline}, mayDrop_));
+    return Text({{"kind", "timeline"},
+                 {"name", timeline.name},
+                 {"timelines", std::move(names)},
+                 {"rate", comp::RateText(timeline.rate)},
+                 {"start", frame(timeline.start)},
+                 {"duration", frame(timeline.duration)},
+                 {"tracks", std::move(all["timelines"][0]["tracks"])},
+                 {"remarks", timeline.remarks}});
   }
 
   void AddPlacement(const comp::Placement& placement, Json* json) const {
@@ -429,6 +470,7 @@ class Viewer {
   std::optional<comp::Sheet> sheet_;
   std::optional<comp::Camera> camera_;  // As the file has it.
   std::vector<comp::Timeline> timelines_;
+  size_t chosen_ = 0;  // Of these.
   std::vector<comp::Shape> shapes_;
   std::vector<double> numbers_;  // What the page looks at.
   std::vector<comp::Report> reports_;
@@ -443,6 +485,7 @@ EMSCRIPTEN_BINDINGS(viewer) {
       .function("setLanguage", &Viewer::SetLanguage)
       .function("setDropFrame", &Viewer::SetDropFrame)
       .function("open", &Viewer::Open)
+      .function("choose", &Viewer::Choose)
       .function("sheet", &Viewer::Sheet)
       .function("timeOf", &Viewer::TimeOf)
       .function("framesIn", &Viewer::FramesIn)
