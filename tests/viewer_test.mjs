@@ -44,7 +44,8 @@ const open = async (name, content) => {
 // Where a point of the frame is on the page.
 const onPage = (x, y) => tab.locator('#stage').evaluate((c, [fx, fy]) => {
   const box = c.getBoundingClientRect(), scale = Math.min(c.clientWidth / 1920, c.clientHeight / 1080) / 1.4;
-  return [box.left + (c.clientWidth - 1920 * scale) / 2 + fx * scale, box.top + (c.clientHeight - 1080 * scale) / 2 + fy * scale];
+  return [box.left + c.clientLeft + (c.clientWidth - 1920 * scale) / 2 + fx * scale,
+    box.top + c.clientTop + (c.clientHeight - 1080 * scale) / 2 + fy * scale];
 }, [x, y]);
 const exact = (name) => tab.evaluate((n) => {
   const dt = [...document.querySelectorAll('#details dt')].find((e) => e.textContent === n);
@@ -92,12 +93,12 @@ assert.match(await text('time'), new RegExp(`frame ${await tab.inputValue('#scru
 // What is under the pointer, and what is selected, is what the program tells.
 await tab.selectOption('#sample', 'space.json');
 const sheet = JSON.parse(comp('--json', join(samples, 'space.json')));
-for (const [x, y] of [[960, 540], [500, 540], [960, 900], [30, 30], [-100, 1000]]) {
+for (const [x, y] of [[960, 540], [500, 540], [960, 900], [30, 30], [-100, 1000], [1, 500], [-1, 500]]) {
   await tab.mouse.move(...await onPage(x, y));
   await painted();
   const there = comp('--svg', join(folder, 'native.svg'), '--time', '0', '--hit', `${x},${y}`, join(samples, 'space.json'));
   const names = there.trim().split('\n').map((line) => line.split(',')[0]).filter((n) => n !== 'nothing');
-  assert.deepEqual((await tab.locator('#hits li').allTextContents()).map((t) => t.split(',')[0]), names);
+  assert.deepEqual(await tab.locator('#hits button:first-child').allTextContents(), names, `${x},${y}`);
 }
 await tab.mouse.click(...await onPage(700, 900));
 await painted();
@@ -147,6 +148,24 @@ await tab.screenshot({ path: join(folder, 'text.png') });
 await set('source', source.replace('"Card"', '"Karte"'));
 await tab.waitForFunction(() => document.getElementById('message').hidden);
 
+// What was there before is gone with its file; links that somebody made are no worse than none.
+await tab.click('#tabLayer');
+await tab.fill('#pointX', '960');
+await tab.fill('#pointY', '900');
+await painted();
+assert.deepEqual(await tab.locator('#hits button:first-child').allTextContents(), ['Floor', 'Backdrop']);
+await set('source', JSON.stringify({ ...JSON.parse(source), layers: [] }));
+await painted();
+await tab.selectOption('#sample', 'film.json');
+await set('number', 1, 'change');
+assert.deepEqual([await tab.locator('#hits li').count(), await exact('Corners on screen')], [0, undefined]);
+for (const hash of ['null', '7', '{"name":{},"text":"{}","tolerance":{},"lane":"length"}', '{"name":"constructor"}', '%']) {
+  await tab.goto('about:blank');
+  await tab.goto(`file://${page}#${hash}`);
+  await painted();
+  assert.match(await tab.title(), /^Space/);
+}
+
 // Nothing in a file runs, or breaks the page.
 const markup = '<img src=x onerror="alert(1)"></textarea><script>alert(2)</script>';
 const layers = Array.from({ length: 100000 }, (_, i) => ({ name: `${i}`, timeBase: '1/600', in: i, out: i + 600, size: [9, 9], position: [i % 99, i % 77] }));
@@ -172,6 +191,9 @@ await tab.keyboard.press('ArrowRight');
 await tab.keyboard.press('ArrowRight');
 await tab.click('#tabLayer');
 assert.deepEqual((await exact('Name')), ['Gulls']);
+await open('two.json', `{"OTIO_SCHEMA": "SerializableCollection.1", "children": [${['A', 'B'].map((n) => `{"OTIO_SCHEMA": "Timeline.1", "name": "${n}"}`)}]}`);
+await tab.selectOption('#timeline', '1');
+await tab.waitForFunction(() => document.title.startsWith('B '));
 
 // Figures to be read, which decide nothing.
 const inSpace = (count) => Array.from({ length: count }, (_, i) => ({
@@ -207,6 +229,11 @@ for (const [language, part] of [['de', 'Überlauf bei der'], ['ja', 'オーバ�
   await painted();
   assert.ok((await text('reports')).includes(part), language);
 }
+await tab.selectOption('#language', 'de');
+await open('falsch.json', '{"name": 1}');
+assert.match(await text('message'), /ist kein Text/);
+await tab.selectOption('#language', 'en');
+await tab.selectOption('#sample', 'space.json');
 
 // The same bits.
 await tab.click('#tabBits');

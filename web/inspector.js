@@ -11,11 +11,12 @@ function button(text, exact) {
   return b;
 }
 
-const one = (value) => (typeof value === 'number' ? button(short(value), String(value)) : button(value, value));
+const exactly = (number) => (Object.is(number, -0) ? '-0' : String(number));
+const one = (value) => (typeof value === 'number' ? button(short(value), exactly(value)) : button(value, value));
 
-// Numbers in rows, or "not seen".
+// Numbers in rows. JSON has no infinite ones.
 function cells(value) {
-  if (value === null) return ['before the near plane'];
+  if (value === null) return ['not finite'];
   if (!Array.isArray(value)) return [one(value)];
   if (value.every((v) => !Array.isArray(v) && v !== null)) return value.map(one);
   return value.map((row) => element('div', {}, ...cells(row)));
@@ -38,6 +39,9 @@ const kLayerRows = [
   ['eye', 'Corners from the eye'], ['crossings', 'Cut at'], ['screen', 'Corners on screen'],
 ];
 
+// A number with its button, for lists elsewhere.
+export const copyable = (number, unit) => button(`${short(number)} ${unit}`, exactly(number));
+
 export function showLayer(parent, layer) {
   const list = element('dl');
   row(list, 'Name', layer.name.slice(0, 200));
@@ -57,7 +61,7 @@ export function showItem(parent, item) {
   for (const [key, name] of [['recordIn', 'Record in'], ['recordOut', 'Record out'], ['sourceIn', 'Source in'], ['sourceOut', 'Source out']]) {
     timeRows(list, name, item[key]);
   }
-  row(list, 'Speed', item.speed);
+  row(list, 'Speed', item.speed ?? 'unknown');
   if (item.size) row(list, 'Size', item.size);
   parent.replaceChildren(list);
 }

@@ -3,7 +3,7 @@
 import { colorOf } from './stage.js';
 
 const kLane = 20, kHead = 18, kLabel = 110;
-const kKinds = { clip: '#7fa8d6', gap: null, transition: '#b04070', stack: '#e3b466' };
+const kKinds = { clip: '#7fa8d6', gap: null, transition: '#e7a1c4', stack: '#e3b466' };
 
 export class Lanes {
   // `on` has seeked(frame), selected(lane, item).
@@ -13,34 +13,50 @@ export class Lanes {
     this.lanes = [];
     this.top = 0;
     canvas.addEventListener('wheel', (e) => {
-      e.preventDefault();
-      this.scroll(this.top + e.deltaY);
+      if (this.scroll(this.top + e.deltaY)) e.preventDefault();
     }, { passive: false });
-    let isSeeking = false;
-    const seek = (e) => on.seeked(this.frameAt(e.clientX - canvas.getBoundingClientRect().left));
+    // A finger that goes up or down scrolls; all else seeks.
+    let grip = null;
     canvas.addEventListener('pointerdown', (e) => {
+      if (e.button !== 0) return;
       canvas.setPointerCapture(e.pointerId);
       canvas.focus();
-      const y = e.clientY - canvas.getBoundingClientRect().top;
-      if (y >= kHead) this.pick(Math.floor((y - kHead + this.top) / kLane), e);
-      isSeeking = true;
-      seek(e);
+      grip = { x: e.offsetX, y: e.offsetY, top: this.top, isFinger: e.pointerType === 'touch', way: '' };
+      if (!grip.isFinger) this.press(e);
     });
-    canvas.addEventListener('pointermove', (e) => isSeeking && seek(e));
-    for (const type of ['pointerup', 'pointercancel']) canvas.addEventListener(type, () => { isSeeking = false; });
+    canvas.addEventListener('pointermove', (e) => {
+      if (!grip) return;
+      const dx = e.offsetX - grip.x, dy = e.offsetY - grip.y;
+      if (grip.isFinger && !grip.way && Math.hypot(dx, dy) > 8) grip.way = Math.abs(dy) > Math.abs(dx) ? 'scrolls' : 'seeks';
+      if (grip.way === 'scrolls') this.scroll(grip.top - dy);
+      else if (e.offsetX >= kLabel && (grip.way || !grip.isFinger)) on.seeked(this.frameAt(e.offsetX));
+    });
+    canvas.addEventListener('pointerup', (e) => {
+      if (grip?.isFinger && !grip.way) this.press(e);
+      grip = null;
+    });
+    canvas.addEventListener('pointercancel', () => { grip = null; });
   }
 
-  // Each lane: {name, items: [{name, kind, in, out}]}, in frames from the start.
+  press(event) {
+    if (event.offsetY >= kHead) this.pick(Math.floor((event.offsetY - kHead + this.top) / kLane), event.offsetX);
+    if (event.offsetX >= kLabel) this.on.seeked(this.frameAt(event.offsetX));
+  }
+
+  // Each lane: {name, items: [{name, kind, in, out}], markers: [{in}]}, in frames from the start.
   open(lanes, duration) {
     this.lanes = lanes;
     this.duration = Math.max(1, duration);
     this.scroll(0);
   }
 
+  // Whether there was anything to scroll.
   scroll(top) {
     const most = Math.max(0, this.lanes.length * kLane - this.canvas.clientHeight + kHead);
+    const before = this.top;
     this.top = Math.max(0, Math.min(most, top));
     this.on.scrolled();
+    return this.top !== before;
   }
 
   show(lane) {
@@ -49,11 +65,12 @@ export class Lanes {
     else if (y > this.top + room) this.scroll(y - room);
   }
 
-  pick(lane, event) {
+  pick(lane, x) {
     if (lane >= this.lanes.length) return;
-    const at = this.frameAt(event.clientX - this.canvas.getBoundingClientRect().left);
-    const item = this.lanes[lane].items.findLastIndex((i) => i.in <= at && at < i.out);
-    this.on.selected(lane, item);
+    const at = this.frameAt(x), { items } = this.lanes[lane];
+    const holds = (i) => i.in <= at && at < i.out;
+    const joined = items.findIndex((i) => i.kind === 'transition' && holds(i));
+    this.on.selected(lane, x < kLabel ? -1 : joined >= 0 ? joined : items.findLastIndex(holds));
   }
 
   get room() { return Math.max(1, this.canvas.clientWidth - kLabel - 8); }
@@ -89,22 +106,31 @@ export class Lanes {
       }
       context.fillStyle = color('--text');
       context.fillText(this.lanes[lane].name.slice(0, 40), 4, y + 14, kLabel - 10);
-      for (const item of this.lanes[lane].items) {
-        const left = x(item.in), right = x(item.out);
-        const fill = item.kind === 'layer' ? colorOf(lane) : kKinds[item.kind];
-        context.strokeStyle = color('--line');
-        context.globalAlpha = item.kind === 'transition' ? 0.6 : 1;
-        if (fill) {
+      const { items, markers } = this.lanes[lane];
+      // Transitions lie on what they join.
+      for (const areJoints of [false, true]) {
+        let covered = -1;
+        for (const item of items) {
+          if ((item.kind === 'transition') !== areJoints) continue;
+          const left = x(item.in), right = x(item.out);
+          if (right < covered + 0.5) continue;
+          covered = Math.max(right, left + 1);
+          const fill = item.kind === 'layer' ? colorOf(lane) : kKinds[item.kind];
+          context.strokeStyle = color('--line');
           context.fillStyle = fill;
-          context.fillRect(left, y + 2, Math.max(1, right - left - 1), kLane - 4);
-        } else {
-          context.strokeRect(left + 0.5, y + 2.5, Math.max(1, right - left - 2), kLane - 5);
+          if (fill) context.fillRect(left, y + 2, Math.max(1, right - left - 1), kLane - 4);
+          else context.strokeRect(left + 0.5, y + 2.5, Math.max(1, right - left - 2), kLane - 5);
+          if (item.kind !== 'layer' && item.kind !== 'gap' && right - left > 30) {
+            context.fillStyle = '#111';
+            context.fillText(item.name.slice(0, Math.floor((right - left) / 6)), left + 3, y + 14);
+          }
         }
-        context.globalAlpha = 1;
-        if (item.kind !== 'layer' && item.kind !== 'gap' && right - left > 30) {
-          context.fillStyle = '#111';
-          context.fillText(item.name.slice(0, Math.floor((right - left) / 6)), left + 3, y + 14);
-        }
+      }
+      context.fillStyle = color('--bad');
+      for (const marker of markers) {
+        context.beginPath();
+        for (const [dx, dy] of [[-4, 0], [4, 0], [0, 7]]) context.lineTo(x(marker.in) + dx, y + dy);
+        context.fill();
       }
     }
     context.restore();

@@ -10,7 +10,7 @@ import makeViewer from 'viewer';
 import { compare } from './bits.js';
 import { $, element } from './dom.js';
 import { Editor } from './editor.js';
-import { showItem, showLayer } from './inspector.js';
+import { copyable, showItem, showLayer } from './inspector.js';
 import { Lanes } from './lanes.js';
 import { colorOf, Stage } from './stage.js';
 
@@ -18,7 +18,6 @@ const kSamples = {
   'space.json': space, 'stage.json': stageSample, 'film.json': film, 'broadcast.json': broadcast, 'sound.json': sound,
   'harbour.otio': harbour,
 };
-const kMostText = 2_000_000; // Of a file in the pane.
 const kMostShared = 50_000; // Of a file in a link.
 
 const viewer = new (await makeViewer()).Viewer();
@@ -29,13 +28,16 @@ let frame = 0; // From the start.
 let selected = { lane: -1, item: -1 };
 let hit = -1;
 let pointer = null; // In the frame.
+let pinned = null; // The point that was picked last.
+let timeline = 0; // Of several in a file.
+let pane = { name: '', text: '' }; // What is in the pane, be it right or wrong.
 let playing = null; // When, and from which frame.
 let hits = { count: 0, layers: [] };
 let isStale = { shapes: true, details: true, hits: true };
 let isAsked = false;
 
 function say(sentence) {
-  $('message').textContent = sentence;
+  $('message').textContent = sentence.slice(0, 500);
   $('message').hidden = sentence === '';
 }
 
@@ -85,7 +87,6 @@ function setFrame(next) {
 function play(isOn) {
   playing = isOn ? { since: performance.now(), frame } : null;
   $('play').textContent = isOn ? 'Pause' : 'Play';
-  $('play').setAttribute('aria-pressed', String(isOn));
   refresh({ details: true });
 }
 
@@ -98,13 +99,15 @@ function point() {
 }
 
 function showHits() {
+  for (const [id, value] of [['pointX', pointer?.[0]], ['pointY', pointer?.[1]]]) {
+    if (document.activeElement !== $(id)) $(id).value = value === undefined ? '' : String(Math.round(value * 100) / 100);
+  }
   const more = hits.count - hits.layers.length;
   $('hits').replaceChildren(...hits.layers.map((h) => {
-    const b = element('button', { type: 'button' }, `${h.name.slice(0, 80)}, ${Number(h.distance.toPrecision(7))} px from its nearest edge`);
-    b.dataset.exact = String(h.distance);
+    const b = element('button', { type: 'button' }, h.name.slice(0, 80));
     b.style.borderLeft = `0.6em solid ${colorOf(h.number)}`;
     b.addEventListener('click', () => select(h.number));
-    return element('li', {}, b);
+    return element('li', {}, b, copyable(h.distance, 'px from its nearest edge'));
   }), ...(more > 0 ? [element('li', {}, `and ${more} more`)] : []));
 }
 
@@ -138,52 +141,82 @@ function lanesOf(opened) {
   if (opened.kind === 'composition') {
     return opened.names.map((n, i) => ({
       name: n,
+      markers: [],
       items: opened.ins[i] === null || opened.outs[i] === null ? []
         : [{ name: n, kind: 'layer', in: opened.ins[i] - opened.start, out: opened.outs[i] - opened.start }],
     }));
   }
   return opened.tracks.map((track, i) => ({
     name: track.name || `${track.kind} ${i + 1}`,
+    markers: track.markers.map((marker) => ({ in: marker.in.frame })),
     items: track.items.map((item) => ({ name: item.name, kind: item.kind, in: item.recordIn.frame, out: item.recordOut.frame })),
   }));
 }
 
-// Opens a text; false, with everything as it was, where it cannot be used.
-function open(text, fileName, isEdited = false) {
-  let opened;
-  try {
-    opened = JSON.parse(viewer.open(text, fileName));
-  } catch {
-    opened = { error: `${fileName}: is too large for this page.`, line: 0 };
-  }
-  if (!isEdited) editor.text = text.length <= kMostText ? text : '';
-  if (opened.error) {
-    say(opened.error);
-    editor.show(opened);
-    return false;
-  }
-  [file, name, given] = [opened, fileName, text];
+const count = () => (isComposition() ? file.names.length : file.tracks.length);
+
+function show(opened) {
+  file = opened;
   say('');
   editor.show(null);
   $('title').textContent = document.title = `${file.name.slice(0, 200)} · ${file.rate} frames a second`;
   $('scrub').max = String(Math.max(1, file.duration) - 1);
-  $('number').max = String(isComposition() ? file.names.length : file.tracks.length);
-  if (!isEdited) {
-    play(false);
-    selected = { lane: -1, item: -1 };
-    frame = 0;
-  }
+  $('number').max = String(count());
+  const timelines = file.timelines ?? [];
+  $('timelines').hidden = timelines.length < 2;
+  $('timeline').replaceChildren(...timelines.map((t, i) => element('option', { value: i }, `${i + 1}. ${t.slice(0, 60)}`)));
+  $('timeline').value = String(timeline);
+  if (selected.lane >= count()) selected = { lane: -1, item: -1 };
+  if (!file.size) pointer = pinned = null;
   document.body.dataset.shows = isComposition() ? 'layers' : 'tracks';
   stage.open(isComposition() ? file : { names: [], size: null });
   lanes.open(lanesOf(file), file.duration);
   setFrame(frame);
+}
+
+// Opens a text, or the bytes of one; false, with everything as it was, where it cannot be used.
+function open(text, fileName, isEdited = false, bytes = text) {
+  let opened;
+  try {
+    opened = JSON.parse(viewer.open(bytes, fileName, isEdited));
+  } catch {
+    opened = { error: `${fileName}: is too large for this page.`, line: 0 };
+  }
+  pane = { name: fileName, text };
+  if (!isEdited) editor.text = text;
+  if (kSamples[fileName] !== text) $('sample').value = '';
+  if (opened.error) {
+    say(opened.error);
+    editor.show(opened, !isEdited);
+    return false;
+  }
+  [name, given] = [fileName, text];
+  if (!isEdited) {
+    play(false);
+    selected = { lane: -1, item: -1 };
+    pointer = pinned = null;
+    frame = timeline = 0;
+  } else if (opened.timelines?.length > timeline) {
+    opened = JSON.parse(viewer.choose(timeline));
+  } else {
+    timeline = 0;
+  }
+  show(opened);
   return true;
 }
 
+// The same again, after a change of what does not stand in it.
+const reopen = () => open(pane.text, pane.name, true);
+
+let opening = 0;
 async function openFile(chosen) {
+  const turn = ++opening;
   try {
-    if (!open(await chosen.text(), chosen.name)) return;
-    $('sample').value = '';
+    const bytes = new Uint8Array(await chosen.arrayBuffer());
+    // Lines as the pane has them. What is not UTF-8 the library refuses.
+    const text = new TextDecoder().decode(bytes).replace(/\r(?!\n)/g, '\n');
+    const isText = new TextEncoder().encode(text).length === bytes.length;
+    if (turn === opening) open(text, chosen.name, false, isText ? text : bytes);
   } catch {
     say(`${chosen.name}: cannot be read.`);
   }
@@ -212,32 +245,58 @@ async function copy(text) {
 // What a link keeps.
 function state() {
   const isSample = kSamples[name] === given;
+  const { hull, bounds, names } = stage.options;
   return {
     name, text: isSample || given.length > kMostShared ? undefined : given, frame, lane: selected.lane, item: selected.item,
-    camera: viewer.camera(), language: $('language').value, drop: $('drop').checked, tolerance: $('tolerance').value,
+    camera: viewer.camera(), language: $('language').value, drop: $('drop').checked, tolerance: Number($('tolerance').value), timeline, hull, bounds, names,
   };
 }
 
 function restore() {
   let kept = {};
   try {
-    kept = JSON.parse(decodeURIComponent(location.hash.slice(1)));
+    kept = Object(JSON.parse(decodeURIComponent(location.hash.slice(1))));
   } catch {
     // A link that was cut shows the first sample.
   }
-  const text = typeof kept.text === 'string' ? kept.text : kSamples[kept.name];
+  const keptName = typeof kept.name === 'string' ? kept.name : 'space.json';
+  const isSample = Object.hasOwn(kSamples, keptName);
+  const text = typeof kept.text === 'string' ? kept.text : isSample ? kSamples[keptName] : null;
   if (['en', 'de', 'fr', 'ja'].includes(kept.language)) $('language').value = kept.language;
-  viewer.setLanguage($('language').value);
+  setLanguage();
   $('drop').checked = kept.drop === true;
   viewer.setDropFrame($('drop').checked);
-  setTolerance(kept.tolerance);
-  if (!(text !== undefined && open(text, String(kept.name)))) open(space, 'space.json');
-  $('sample').value = kSamples[name] === given ? name : '';
+  setTolerance(typeof kept.tolerance === 'number' ? kept.tolerance : 0);
+  for (const option of kOptions) {
+    stage.options[option] = typeof kept[option] === 'boolean' ? kept[option] : option === 'names';
+    $(option).checked = stage.options[option];
+  }
+  if (text === null || !open(text, keptName)) {
+    const sentence = text === null ? `${keptName.slice(0, 200)}: was too large for the link.` : $('message').textContent;
+    open(space, 'space.json');
+    say(sentence);
+    kept = {};
+  }
+  $('sample').value = Object.hasOwn(kSamples, name) && kSamples[name] === given ? name : '';
+  if (Number.isInteger(kept.timeline) && kept.timeline > 0 && kept.timeline < (file.timelines?.length ?? 0)) choose(kept.timeline);
   if (typeof kept.camera === 'string') viewer.setCamera(kept.camera);
   if (Number.isSafeInteger(kept.frame)) setFrame(kept.frame);
-  const count = isComposition() ? file.names.length : file.tracks.length;
-  if (Number.isInteger(kept.lane) && kept.lane >= 0 && kept.lane < count) select(kept.lane, kept.item);
+  if (Number.isInteger(kept.lane) && kept.lane >= 0 && kept.lane < count()) {
+    select(kept.lane, Number.isInteger(kept.item) ? kept.item : -1);
+  }
   refresh({ shapes: true, details: true });
+}
+
+function setLanguage() {
+  viewer.setLanguage($('language').value);
+  for (const id of ['message', 'place', 'reports']) $(id).lang = $('language').value;
+}
+
+function choose(chosen) {
+  timeline = chosen;
+  selected = { lane: -1, item: -1 };
+  frame = 0;
+  show(JSON.parse(viewer.choose(chosen)));
 }
 
 function setTolerance(value) {
@@ -252,11 +311,11 @@ const stage = new Stage($('stage'), viewer, {
     point();
   },
   left() {
-    pointer = null;
+    pointer = pinned;
     point();
   },
   picked(x, y) {
-    pointer = [x, y];
+    pointer = pinned = [x, y];
     point();
     if (hit >= 0) select(hit);
   },
@@ -272,7 +331,8 @@ const lanes = new Lanes($('lanes'), {
   selected: select,
   scrolled: () => file && refresh(),
 });
-const editor = new Editor((text) => open(text, name, true));
+const editor = new Editor((text) => open(text, pane.name, true));
+const kOptions = ['hull', 'bounds', 'names'];
 
 $('sample').append(element('option', { value: '' }, '—'), ...Object.keys(kSamples).map((s) => element('option', { value: s }, s)));
 $('sample').addEventListener('change', (e) => e.target.value && open(kSamples[e.target.value], e.target.value));
@@ -280,25 +340,33 @@ $('file').addEventListener('change', (e) => {
   if (e.target.files[0]) openFile(e.target.files[0]);
   e.target.value = '';
 });
-$('language').addEventListener('change', (e) => {
-  viewer.setLanguage(e.target.value);
-  open(editor.text || given, name, true);
+$('language').addEventListener('change', () => {
+  setLanguage();
+  reopen();
 });
 $('drop').addEventListener('change', (e) => {
   viewer.setDropFrame(e.target.checked);
-  open(given, name, true);
+  reopen();
 });
+$('timeline').addEventListener('change', (e) => choose(Number(e.target.value)));
+for (const id of ['pointX', 'pointY']) {
+  $(id).addEventListener('input', () => {
+    const [x, y] = ['pointX', 'pointY'].map((i) => $(i).valueAsNumber);
+    if (Number.isFinite(x) && Number.isFinite(y)) pointer = pinned = [x, y];
+    point();
+  });
+}
 $('play').addEventListener('click', () => play(!playing));
 $('stop').addEventListener('click', () => {
   play(false);
   setFrame(0);
 });
-for (const [id, step] of [['back', -1], ['forward', 1]]) {
-  $(id).addEventListener('click', () => {
-    play(false);
-    setFrame(frame + step);
-  });
+function step(frames) {
+  play(false);
+  setFrame(frame + frames);
 }
+$('back').addEventListener('click', () => step(-1));
+$('forward').addEventListener('click', () => step(1));
 $('scrub').addEventListener('input', (e) => {
   play(false);
   setFrame(Number(e.target.value));
@@ -307,7 +375,7 @@ $('reset').addEventListener('click', () => {
   viewer.resetCamera();
   refresh({ shapes: true, details: true });
 });
-for (const option of ['hull', 'bounds', 'names']) {
+for (const option of kOptions) {
   $(option).addEventListener('change', (e) => {
     stage.options[option] = e.target.checked;
     refresh({ shapes: true });
@@ -333,8 +401,10 @@ $('link').addEventListener('click', () => {
   if (given.length > kMostShared && kSamples[name] !== given) say('The file is too large for a link: it keeps all but the file.');
 });
 $('run').addEventListener('click', () => compare(viewer));
-$('details').addEventListener('click', (e) => e.target.dataset?.exact !== undefined && copy(e.target.dataset.exact));
-window.addEventListener('hashchange', restore);
+for (const id of ['details', 'hits']) {
+  $(id).addEventListener('click', (e) => e.target.dataset?.exact !== undefined && copy(e.target.dataset.exact));
+}
+window.addEventListener('hashchange', () => location.hash.length > 1 && restore());
 window.addEventListener('resize', () => refresh());
 matchMedia('(prefers-color-scheme: dark)').addEventListener('change', () => refresh());
 
@@ -358,26 +428,28 @@ for (const tab of tabs) {
   });
 }
 $('lanes').addEventListener('keydown', (e) => {
-  const count = isComposition() ? file.names.length : file.tracks.length;
+  if (count() === 0 || e.ctrlKey || e.altKey || e.metaKey) return;
+  const items = lanes.lanes[selected.lane]?.items ?? [];
   if (e.key === 'ArrowDown' || e.key === 'ArrowUp') {
-    select(Math.max(0, Math.min(count - 1, selected.lane + (e.key === 'ArrowDown' ? 1 : -1))), isComposition() ? -1 : 0);
+    select(Math.max(0, Math.min(count() - 1, selected.lane + (e.key === 'ArrowDown' ? 1 : -1))), isComposition() ? -1 : 0);
   } else if (e.key === 'ArrowLeft' || e.key === 'ArrowRight') {
-    const step = e.key === 'ArrowRight' ? 1 : -1;
-    if (isComposition()) setFrame(frame + step);
-    else select(selected.lane, Math.max(0, selected.item + step));
-  } else if (e.key === 'Enter' && selected.lane >= 0) {
-    const item = lanes.lanes[selected.lane].items[Math.max(0, selected.item)];
-    if (item) setFrame(item.in);
+    const way = e.key === 'ArrowRight' ? 1 : -1;
+    if (isComposition()) step(way);
+    else if (selected.lane >= 0) select(selected.lane, Math.max(0, Math.min(items.length - 1, selected.item + way)));
+  } else if (e.key === 'Enter' && items.length > 0) {
+    play(false);
+    setFrame(items[Math.max(0, selected.item)].in);
   } else {
     return;
   }
   e.preventDefault();
 });
 document.addEventListener('keydown', (e) => {
-  if (e.target.closest?.('input, textarea, select, button')) return;
+  const isPressed = e.key === ' ' && e.target.closest?.('button, summary, [role=tab]');
+  if (isPressed || e.ctrlKey || e.altKey || e.metaKey || e.target.closest?.('input, textarea, select')) return;
   if (e.key === ' ') play(!playing);
-  else if (e.key === ',') setFrame(frame - 1);
-  else if (e.key === '.') setFrame(frame + 1);
+  else if (e.key === ',') step(-1);
+  else if (e.key === '.') step(1);
   else return;
   e.preventDefault();
 });

@@ -43,8 +43,9 @@ export class Stage {
       pointercancel: (e) => this.up(e), pointerleave: () => on.left(), keydown: (e) => this.key(e),
     })) canvas.addEventListener(type, handler);
     canvas.addEventListener('wheel', (e) => {
+      if (e.ctrlKey) return;
       e.preventDefault();
-      this.camera(() => viewer.dolly(Math.exp(e.deltaY / 500)));
+      this.camera(() => viewer.dolly(Math.exp(Math.max(-500, Math.min(500, e.deltaY)) / 500)));
     }, { passive: false });
   }
 
@@ -117,7 +118,8 @@ export class Stage {
     // What is outside the frame is dimmed.
     context.fillStyle = color('--veil');
     context.beginPath();
-    context.rect(-w, -h, 3 * w, 3 * h);
+    const around = 2 * Math.max(w, h);
+    context.rect(-around, -around, w + 2 * around, h + 2 * around);
     context.rect(0, 0, w, h);
     context.fill('evenodd');
     context.strokeStyle = color('--text');
@@ -194,12 +196,11 @@ export class Stage {
   toFrame(event) {
     const place = this.layout();
     if (!place) return null;
-    const box = this.canvas.getBoundingClientRect();
-    return [((event.clientX - box.left) * place.ratio - place.x) / place.scale,
-      ((event.clientY - box.top) * place.ratio - place.y) / place.scale];
+    return [(event.offsetX * place.ratio - place.x) / place.scale, (event.offsetY * place.ratio - place.y) / place.scale];
   }
 
   down(event) {
+    if (event.button > 1) return;
     this.canvas.setPointerCapture(event.pointerId);
     this.pointers.set(event.pointerId, [event.clientX, event.clientY]);
     this.distance = 0;
@@ -209,22 +210,21 @@ export class Stage {
   move(event) {
     const last = this.pointers.get(event.pointerId);
     const at = this.toFrame(event);
-    if (!last) {
-      if (at) this.on.pointed(...at);
-      return;
-    }
+    if (at) this.on.pointed(...at);
+    if (!last) return;
     const dx = event.clientX - last[0], dy = event.clientY - last[1];
     const others = [...this.pointers].filter(([id]) => id !== event.pointerId).map(([, point]) => point);
     this.pointers.set(event.pointerId, [event.clientX, event.clientY]);
     this.distance += Math.hypot(dx, dy);
-    const unit = this.size ? this.size[0] / this.canvas.clientWidth : 1;
+    const place = this.layout();
+    const unit = place ? place.ratio / place.scale : 1;
     this.camera(() => {
       if (others.length > 0) {
         const away = (x, y) => Math.max(1, Math.hypot(x - others[0][0], y - others[0][1]));
         this.viewer.dolly(away(...last) / away(event.clientX, event.clientY));
         this.viewer.pan(-dx * unit / 2, -dy * unit / 2);
       } else if (event.shiftKey || event.buttons === 4) {
-        this.viewer.pan(-dx * unit * 1.4, -dy * unit * 1.4);
+        this.viewer.pan(-dx * unit, -dy * unit);
       } else {
         this.viewer.orbit(dx / 4, dy / 4);
       }
@@ -238,6 +238,7 @@ export class Stage {
   }
 
   key(event) {
+    if (event.ctrlKey || event.altKey || event.metaKey) return;
     const arrows = { ArrowLeft: [-1, 0], ArrowRight: [1, 0], ArrowUp: [0, -1], ArrowDown: [0, 1] };
     const arrow = arrows[event.key];
     const changes = { '+': () => this.viewer.dolly(0.9), '=': () => this.viewer.dolly(0.9), '-': () => this.viewer.dolly(1 / 0.9),
