@@ -82,6 +82,7 @@ std::optional<M_Ratio> Nearest(const Fraction& fraction, uint32_t most) {
   if (magnitude <= kMost && fraction.den <= most) {
     return M_Ratio{static_cast<int32_t>(fraction.num), static_cast<uint32_t>(fraction.den)};
   }
+  if (magnitude / fraction.den > kMost) return {};
   // Along the convergents; the last step goes as far as there is room.
   Wide n = magnitude, d = fraction.den;
   Wide num[] = {1, 0}, den[] = {0, 1};
@@ -101,7 +102,6 @@ std::optional<M_Ratio> Nearest(const Fraction& fraction, uint32_t most) {
     if (step < term) break;
     n = std::exchange(d, n % d);
   }
-  if (den[0] == 0) return {};
   return M_Ratio{static_cast<int32_t>(fraction.num < 0 ? -num[0] : num[0]),
                  static_cast<uint32_t>(den[0])};
 }

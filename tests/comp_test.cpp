@@ -58,7 +58,7 @@ TEST(Rates, AreWhatDecimalsStandFor) {
     EXPECT_TRUE(read && read->ratio == ratio && read->isExact == isExact) << text;
   }
   EXPECT_EQ(comp::ToRatio("23.976", false)->ratio, (M_Ratio{2997, 125}));
-  for (const char* bad : {"", "x", "1e40", "nan", "1 "})
+  for (const char* bad : {"", "x", "1e40", "2147483648", "nan", "1 "})
     EXPECT_FALSE(comp::ToRatio(bad, true)) << bad;
 }
 
