@@ -62,7 +62,7 @@ function paint() {
   }
   if (isStale.shapes) {
     stage.update(atFrame());
-    point();
+    look();
     if (!playing) showReports();
   }
   stage.draw(isComposition() ? selected.lane : -1, hit, Number($('tolerance').value));
@@ -90,12 +90,18 @@ function play(isOn) {
   refresh({ details: true });
 }
 
-// The layers under the pointer; their list with the next picture.
-function point() {
+// The layers under the pointer.
+function look() {
   const isOver = pointer && isComposition();
   hits = isOver ? JSON.parse(viewer.hits(...pointer, Number($('tolerance').value))) : { count: 0, layers: [] };
   hit = hits.count > 0 ? hits.layers[0].number : -1;
-  refresh({ hits: true });
+  isStale.hits = true;
+}
+
+// The same, and their list with the next picture.
+function point() {
+  look();
+  refresh();
 }
 
 function showHits() {
